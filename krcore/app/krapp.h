@@ -27,6 +27,8 @@ public:
 
     // The process's KrApp; made on first use (owned by the QCoreApplication) when none exists.
     static KrApp* instance();
+    // The process's KrApp if one exists; never makes one (safe during shutdown).
+    static KrApp* existingInstance();
 
     // Class factories of krcore and of every loaded plug-in, in registration order.
     KrClassFactory* findClassFactory(const QString& className) const; // null if none
@@ -59,11 +61,14 @@ public:
     void setRenderMgr(KrRenderMgr* mgr);
     KrUndoStack* getUndoStack() const;
 
+    // Hands url to the desktop's handler. False when the URL is invalid or no handler could
+    // take it (as on a platform without a desktop, where the request is only logged).
     bool showURL(const QString& url);
 
 signals:
     void classFactoriesChanged();
     void pluginLoaded(KrPlugin* plugin);
+    void urlRequested(const QString& url);
 
 private:
     struct Private;

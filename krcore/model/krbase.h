@@ -46,8 +46,7 @@ private:
 };
 
 // A shared pointer over KrRefCountedItem.
-template <class T>
-class KrTSharedPointer
+template <class T> class KrTSharedPointer
 {
 public:
     KrTSharedPointer(T* p = nullptr) : m_p(p)

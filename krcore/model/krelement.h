@@ -23,26 +23,30 @@ public:
     KrPropertyIterator propertyListIterator() const;
     QList<KrProperty*> getProperties() const;
 
-    void addProperty(KrProperty* property);  // emits propertyListChanged()
-    void removeProperty(KrProperty* property); // emits propertyListChanged()
+    void addProperty(KrProperty* property);                   // emits propertyListChanged()
+    void removeProperty(KrProperty* property);                // emits propertyListChanged()
     void setProperties(const QList<KrProperty*>& properties); // one propertyListChanged()
 
     // Writes the element's state (name and property values) into settings; setAttributes
     // reads it back. Subclasses add what they own. setAttributes answers false when the record
     // could not be read at all.
+    // Layout: "Name" (string) and the nested record "Properties" with each value under its
+    // property's name (a second property of the same name under a numbered variant, so none
+    // overwrites another). Values missing from the record or of the wrong type are left as
+    // they are.
     virtual void getAttributes(KrSettings* settings) const;
     virtual bool setAttributes(const KrSettings* settings);
 
 public slots:
     int getNumProperties() const;
-    KrProperty* getProperty(int i) const; // null when out of range
+    KrProperty* getProperty(int i) const;                // null when out of range
     KrProperty* findProperty(const QString& name) const; // null when none has that name
     // True when name is used by no property. With makeUnique, a used name is changed in place
     // to a free one ("Name1", "Name2", ...) and the answer is true.
     bool isPropertyNameUnique(QString& name, bool makeUnique) const;
 
 signals:
-    void propertyListChanged(); // properties added or removed
+    void propertyListChanged(); // properties added, removed, hidden or shown again
     void propertyTreeChanged(); // a property's path changed
 
 private:

@@ -31,6 +31,8 @@ public:
     bool contains(const QString& key) const;
     void removeValue(const QString& key);
     void sync();
+    // The file the settings live in.
+    QString fileName() const;
 
     // Points every KrAppSettings at one INI file in folder (tests use a temporary folder).
     // An empty folder returns to the user's normal settings.

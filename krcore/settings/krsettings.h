@@ -19,7 +19,9 @@ public:
     KrSettings& operator=(const KrSettings& other);
     ~KrSettings();
 
-    bool operator==(const KrSettings& other) const; // same keys in the same order, same values
+    // Same keys in the same order, same values; floats compare bit for bit (NaN equals
+    // itself, -0 differs from 0).
+    bool operator==(const KrSettings& other) const;
     bool operator!=(const KrSettings& other) const { return !(*this == other); }
 
     int getNumKeys() const;
@@ -41,7 +43,8 @@ public:
     QString getStringValue(const QString& key, const QString& defaultValue = QString()) const;
 
     // Makes a new, empty nested record under key (replacing any value there) and returns it.
-    // The record is owned by this one.
+    // The record is owned by this one. A nested record already there is emptied in place, so
+    // pointers to it stay valid.
     KrSettings* setSettingsValue(const QString& key);
     // Stores a copy of value under key and returns the stored copy.
     KrSettings* setSettingsValue(const QString& key, const KrSettings& value);
@@ -55,7 +58,9 @@ public:
     // Readable XML text that keeps key order and types and round-trips every value exactly.
     QString toString() const;
     // Replaces this record with the one in text. Answers false, leaving the record as it was,
-    // when text is not such a record.
+    // when text is not such a record: malformed or truncated XML, unknown elements or
+    // attributes, values that do not fit their type, a key twice in one record, nesting deeper
+    // than 256 records or more than 64 Mi characters.
     bool fromString(const QString& text);
 
 private:

@@ -46,6 +46,9 @@ public:
     QString undoText() const;
     QString redoText() const;
     QString text(int index) const;
+    // Sum of the size() of the items of step index (0 for no such step).
+    int stepSize(int index) const;
+    // During a replay the clearing waits until the replay is over.
     void clear();
 
     // Edit menu actions whose texts follow the next step ("Undo Move Bricks").
@@ -62,6 +65,7 @@ signals:
 
 private:
     friend class KrUndoStackHold;
+    void finishReplay();
     struct Private;
     std::unique_ptr<Private> d;
 };
@@ -72,7 +76,8 @@ extern KRCORE_EXPORT KrUndoStack* krUndoStack;
 
 // Gathers every item pushed while it lives into one step named by accept(text). A hold that
 // is never accepted makes no step (its items are discarded). Holds nest: an inner hold joins
-// the outer step.
+// the outer step, which is made when the outermost hold ends and is named by the outermost
+// hold that was accepted. Holds opened while a stack replays an undo or redo make nothing.
 class KRCORE_EXPORT KrUndoStackHold
 {
 public:
@@ -83,4 +88,5 @@ public:
 private:
     Q_DISABLE_COPY(KrUndoStackHold)
     bool m_accepted = false;
+    int m_level = 0; // 0 for the outermost hold of a nest
 };
