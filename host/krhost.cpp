@@ -6,6 +6,8 @@
 #include "krclassfactory.h"
 #include "krmainwindow.h"
 #include "krpane.h"
+#include "krscene.h"
+#include "krscenepane.h"
 
 #include <QApplication>
 #include <QDockWidget>
@@ -62,6 +64,11 @@ KrMainWindow* KrHost::mainWindow() const
     return m_window.get();
 }
 
+KrScene* KrHost::scene() const
+{
+    return m_scene.get();
+}
+
 QScriptEngine* KrHost::scriptEngine()
 {
     return m_engine.get();
@@ -74,10 +81,17 @@ void KrHost::start()
     m_window->resize(1400, 900);
     m_window->setCentralWidget(new KrViewport);
 
+    // The scene exists before the plug-ins, so their panes can read from it at start.
+    m_scene.reset(new KrScene);
+    m_scene->createDefaultContents();
+    m_scene->makeCurrent();
+
     const QString folder =
         m_options.pluginFolder.isEmpty() ? KrApp::defaultPluginFolder() : m_options.pluginFolder;
     krApp->loadPlugins(folder);
     createContributedObjects();
+    auto* scenePane = new KrScenePane(m_scene.get());
+    QDockWidget* sceneDock = m_window->addPane(scenePane);
     const bool restored = m_window->restoreLayout();
     setUpScriptEngine();
 
@@ -85,8 +99,13 @@ void KrHost::start()
     if (KrPane* corvane = m_window->getPaneMgr()->findPane(QStringLiteral("KrCorvanePane"))) {
         QDockWidget* dock = m_window->getPaneMgr()->getDock(corvane);
         if (!restored) {
-            // First start: the editor takes most of the window beside the viewport.
-            m_window->resizeDocks({dock}, {m_window->width() * 3 / 4}, Qt::Horizontal);
+            // First start: the editor takes most of the window beside the viewport, the
+            // scene a narrow column next to it.
+            if (sceneDock && m_window->dockWidgetArea(dock) == m_window->dockWidgetArea(sceneDock))
+                m_window->splitDockWidget(dock, sceneDock, Qt::Horizontal);
+            m_window->resizeDocks({dock, sceneDock},
+                                  {m_window->width() * 11 / 20, m_window->width() / 5},
+                                  Qt::Horizontal);
         }
         dock->show();
         dock->raise();
@@ -124,6 +143,7 @@ void KrHost::setUpScriptEngine()
     global.setProperty(QStringLiteral("exit"), m_engine->newFunction(scriptExit, &m_exitRequested));
     global.setProperty(QStringLiteral("mainWindow"), m_engine->newQObject(m_window.get()));
     global.setProperty(QStringLiteral("krApp"), m_engine->newQObject(krApp));
+    global.setProperty(QStringLiteral("scene"), m_engine->newQObject(m_scene.get()));
     for (int i = 0; i < krApp->getNumClassFactories(); ++i)
         krApp->getClassFactory(i)->registerClass(m_engine.get());
 }

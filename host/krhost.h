@@ -6,6 +6,7 @@
 #include <memory>
 
 class KrMainWindow;
+class KrScene;
 
 // The host application: its main window, the plug-ins' panes and actions, and the script
 // engine that knows every contributed class.
@@ -28,6 +29,7 @@ public:
     void start();
 
     KrMainWindow* mainWindow() const;
+    KrScene* scene() const;
     QScriptEngine* scriptEngine();
 
 private:
@@ -38,6 +40,8 @@ private:
     bool writeScreenshot(const QString& fileName);
 
     Options m_options;
+    // Outlives the window: the panes show and edit it.
+    std::unique_ptr<KrScene> m_scene;
     std::unique_ptr<KrMainWindow> m_window;
     std::unique_ptr<QScriptEngine> m_engine;
     bool m_exitRequested = false;
