@@ -401,7 +401,7 @@ void TestKrConnectorItem::dropRefused()
     QFETCH(QString, target);
     KrSceneHarness h;
     Pair p = makePair(h);
-    auto brickOf = [&](const QString& spec) { return spec.startsWith('a') ? p.a : p.b; };
+    auto brickOf = [&](const QString& which) { return which.startsWith('a') ? p.a : p.b; };
     KrBrickParam* sourceParam = brickOf(source)->findParameterByArg(source.mid(2));
     KrConnectorItem* targetPlug = h.plug(brickOf(target), target.mid(2));
     QVERIFY(sourceParam && targetPlug);

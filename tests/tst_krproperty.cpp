@@ -459,8 +459,8 @@ void TestKrProperty::path_data()
                                            << "/Diffuse/Color";
     QTest::newRow("doubled and trailing") << "//Diffuse//Color/"
                                           << "/Diffuse/Color";
-    QTest::newRow("blank parts") << " / Spec / "
-                                 << "/Spec";
+    QTest::newRow("blank parts") << " / Shine / "
+                                 << "/Shine";
 }
 
 void TestKrProperty::path()

@@ -457,23 +457,23 @@ void TestKrPropertyWgt::listViewGroupsByPath()
     KrIntProperty top(QStringLiteral("Top"));
     KrColorProperty color(QStringLiteral("Color"));
     color.setPath(QStringLiteral("/Diffuse"));
-    KrFloatProperty spec(QStringLiteral("Roughness"));
-    spec.setPath(QStringLiteral("/Diffuse/Spec"));
+    KrFloatProperty shine(QStringLiteral("Roughness"));
+    shine.setPath(QStringLiteral("/Diffuse/Shine"));
     KrBoolProperty other(QStringLiteral("On"));
     other.setPath(QStringLiteral("/Other"));
     KrFloatProperty weight(QStringLiteral("Weight"));
     weight.setPath(QStringLiteral("/Diffuse"));
 
     QVERIFY(!view.addProperty(nullptr));
-    for (KrProperty* p : QList<KrProperty*>{&top, &color, &spec, &other, &weight})
+    for (KrProperty* p : QList<KrProperty*>{&top, &color, &shine, &other, &weight})
         QVERIFY(view.addProperty(p));
     const QList<KrPropertyWgt*> widgets = view.getPropertyWidgets();
     QCOMPARE(widgets.size(), 5);
     QCOMPARE(widgets.at(1)->metaObject()->className(), "KrColorPropertyWgt");
-    QCOMPARE(widgets.at(2)->getFirstProperty(), &spec);
+    QCOMPARE(widgets.at(2)->getFirstProperty(), &shine);
 
     KrWidgetGroup* diffuse = view.findGroup(QStringLiteral("/Diffuse"));
-    KrWidgetGroup* specGroup = view.findGroup(QStringLiteral("Diffuse/Spec"));
+    KrWidgetGroup* specGroup = view.findGroup(QStringLiteral("Diffuse/Shine"));
     QVERIFY(diffuse);
     QVERIFY(specGroup);
     QVERIFY(!view.findGroup(QStringLiteral("/")));

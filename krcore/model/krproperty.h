@@ -188,7 +188,7 @@ private:
     QString m_default;
 };
 
-// A colour, kept as RGB (other specs are converted). Stored in settings as a nested record
+// A colour, kept as RGB (other colour models are converted). Stored in settings as a nested record
 // with "Red", "Green", "Blue" and "Alpha" floats in 0..1.
 class KRCORE_EXPORT KrColorProperty : public KrProperty
 {
