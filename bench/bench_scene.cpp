@@ -295,9 +295,13 @@ void runSize(int count, bool openOnly, QTextStream& out)
     out << QStringLiteral("  paint, 100 %       %1 ms\n").arg(paint100Ms, 0, 'f', 1);
     out << QStringLiteral("  move (20 wires)    %1 ms per step\n").arg(moveMs, 0, 'f', 3);
     out << QStringLiteral("  auto-arrange       %1 ms\n").arg(arrangeMs, 0, 'f', 1);
-    out << QStringLiteral("  delete all         %1 ms (%2 left)\n").arg(deleteMs, 0, 'f', 1).arg(left);
+    out << QStringLiteral("  delete all         %1 ms (%2 left)\n")
+               .arg(deleteMs, 0, 'f', 1)
+               .arg(left);
     out << QStringLiteral("    brick user alone %1 ms\n").arg(model.first, 0, 'f', 1);
-    out << QStringLiteral("  undo delete        %1 ms (%2 back)\n").arg(undoMs, 0, 'f', 1).arg(back);
+    out << QStringLiteral("  undo delete        %1 ms (%2 back)\n")
+               .arg(undoMs, 0, 'f', 1)
+               .arg(back);
     out << QStringLiteral("    brick user alone %1 ms\n").arg(model.second, 0, 'f', 1);
     out << QStringLiteral("  peak memory        %1 MB\n").arg(peakMemoryKb() / 1024.0, 0, 'f', 1);
     out.flush();

@@ -42,8 +42,7 @@ class KrDetailProxy : public QGraphicsProxyWidget
 {
 public:
     explicit KrDetailProxy(QGraphicsItem* parent) : QGraphicsProxyWidget(parent) {}
-    void paint(QPainter* painter, const QStyleOptionGraphicsItem* option,
-               QWidget* widget) override
+    void paint(QPainter* painter, const QStyleOptionGraphicsItem* option, QWidget* widget) override
     {
         if (lodOf(painter, option) >= kWidgetDetail) {
             QGraphicsProxyWidget::paint(painter, option, widget);
@@ -539,8 +538,8 @@ QVariant KrBrickGraphicsItem::itemChange(GraphicsItemChange change, const QVaria
     switch (change) {
     case ItemPositionChange: {
         d->lastPos = pos();
-        return QGraphicsProxyWidget::itemChange(
-            change, KrBrickUserScene::clampPosition(value.toPointF()));
+        return QGraphicsProxyWidget::itemChange(change,
+                                                KrBrickUserScene::clampPosition(value.toPointF()));
     }
     case ItemPositionHasChanged: {
         for (KrConnectorItem* plug : qAsConst(d->connectors)) {

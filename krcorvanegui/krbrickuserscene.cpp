@@ -45,7 +45,7 @@ const QString kHeight = QStringLiteral("Height");
 const qreal kMinPos = 10;
 // Bricks added one after another (opening a network, undoing a large delete) have their
 // posted work carried out in batches: a queue of thousands of posted events slows every post.
-const int kFlushBatch = 1 << 30;
+const int kFlushBatch = 64;
 
 KrUndoStack* sceneUndoStack()
 {
@@ -666,9 +666,9 @@ void KrBrickUserScene::toGroup()
                 for (int c = 0; c < param->getNumConnections(); ++c) {
                     const Ends ends = endsOf(param, param->getConnection(c)->getParam());
                     if (ends.valid)
-                        sceneUndoStack()->push(new KrConnectionAddedItem(
-                            this, ends.inputBrick, ends.outputBrick, ends.inputIndex,
-                            ends.outputIndex));
+                        sceneUndoStack()->push(
+                            new KrConnectionAddedItem(this, ends.inputBrick, ends.outputBrick,
+                                                      ends.inputIndex, ends.outputIndex));
                 }
             }
         }
@@ -697,13 +697,12 @@ bool KrBrickUserScene::connectParameters(KrBrickParam* a, KrBrickParam* b)
         if (old && old != ends.output) {
             const Ends replaced = endsOf(ends.input, old);
             if (replaced.valid)
-                sceneUndoStack()->push(new KrConnectionRemovedItem(this, replaced.inputBrick,
-                                                                   replaced.outputBrick,
-                                                                   replaced.inputIndex,
-                                                                   replaced.outputIndex));
+                sceneUndoStack()->push(
+                    new KrConnectionRemovedItem(this, replaced.inputBrick, replaced.outputBrick,
+                                                replaced.inputIndex, replaced.outputIndex));
         }
-        sceneUndoStack()->push(new KrConnectionAddedItem(
-            this, ends.inputBrick, ends.outputBrick, ends.inputIndex, ends.outputIndex));
+        sceneUndoStack()->push(new KrConnectionAddedItem(this, ends.inputBrick, ends.outputBrick,
+                                                         ends.inputIndex, ends.outputIndex));
         hold.accept(QStringLiteral("Brick Connection..."));
     }
     return ends.input->addConnection(ends.output);
@@ -887,7 +886,9 @@ KrBrickLayoutUndoItem* KrBrickUserScene::layoutAsStep(const QString& text,
     for (auto it = d->itemsById.cbegin(); it != d->itemsById.cend(); ++it)
         before.insert(it.key(), {it.value()->pos(), it.value()->zValue()});
     change();
-    if (!canRecord())
+    // A layout made while the window is being put together (arranged or turned round as it
+    // opens) is no edit of the user's.
+    if (!canRecord() || (d->view && !d->view->isVisible()))
         return nullptr;
     auto* step = new KrBrickLayoutUndoItem(this);
     for (auto it = before.cbegin(); it != before.cend(); ++it) {
@@ -989,7 +990,8 @@ void KrBrickUserScene::flipPositions()
     float maxW = 0.0f;
     for (KrBrickGraphicsItem* item : qAsConst(d->itemsById)) {
         const float x = float(item->pos().x());
-        const float w = item->getFrame() ? float(item->getFrame()->width()) : float(item->size().width());
+        const float w =
+            item->getFrame() ? float(item->getFrame()->width()) : float(item->size().width());
         if (x < minX)
             minX = x;
         else if (x > maxX)
@@ -1354,10 +1356,9 @@ void KrBrickAddedUndoItem::redo()
 }
 
 KrConnectionRemovedItem::KrConnectionRemovedItem(KrBrickUserScene* scene, uint brickId,
-                                                 uint srcBrickId, int paramIndex,
-                                                 int srcParamIndex)
-    : KrBrickSceneUndoItem(scene), brickId(brickId), srcBrickId(srcBrickId),
-      paramIndex(paramIndex), srcParamIndex(srcParamIndex)
+                                                 uint srcBrickId, int paramIndex, int srcParamIndex)
+    : KrBrickSceneUndoItem(scene), brickId(brickId), srcBrickId(srcBrickId), paramIndex(paramIndex),
+      srcParamIndex(srcParamIndex)
 {
 }
 
@@ -1396,8 +1397,8 @@ void KrConnectionRemovedItem::redo()
     disconnect();
 }
 
-KrConnectionAddedItem::KrConnectionAddedItem(KrBrickUserScene* scene, uint brickId,
-                                             uint srcBrickId, int paramIndex, int srcParamIndex)
+KrConnectionAddedItem::KrConnectionAddedItem(KrBrickUserScene* scene, uint brickId, uint srcBrickId,
+                                             int paramIndex, int srcParamIndex)
     : KrConnectionRemovedItem(scene, brickId, srcBrickId, paramIndex, srcParamIndex)
 {
 }

@@ -48,8 +48,7 @@ class KrPlugLabel : public QGraphicsSimpleTextItem
 {
 public:
     using QGraphicsSimpleTextItem::QGraphicsSimpleTextItem;
-    void paint(QPainter* painter, const QStyleOptionGraphicsItem* option,
-               QWidget* widget) override
+    void paint(QPainter* painter, const QStyleOptionGraphicsItem* option, QWidget* widget) override
     {
         if (lodOf(painter, option) < kLabelDetail)
             return;
@@ -65,16 +64,18 @@ public:
     using QGraphicsEllipseItem::QGraphicsEllipseItem;
     QColor typeColor;
 
-    void paint(QPainter* painter, const QStyleOptionGraphicsItem* option,
-               QWidget* widget) override
+    void paint(QPainter* painter, const QStyleOptionGraphicsItem* option, QWidget* widget) override
     {
         painter->save();
         painter->setRenderHint(QPainter::Antialiasing);
         const qreal lod = lodOf(painter, option);
         QPen outline = pen();
-        // A hairline at least, however far the view is zoomed out.
+        // A hairline at least, however far the view is zoomed out; a small plug shows its
+        // colour rather than a black rim.
         if (lod < 1.0)
             outline.setCosmetic(true);
+        if (lod < 0.5)
+            outline.setColor(brush().color().darker(160));
         painter->setPen(outline);
         painter->setBrush(brush());
         painter->drawEllipse(rect());
@@ -178,8 +179,8 @@ KrConnectorItem::KrConnectorItem(KrBrickParam* param, KrBrickGraphicsItem* brick
     if (param)
         connect(param, &KrBrickParam::typeChanged, this, &KrConnectorItem::updateText);
 
-    QColor initial = brickItem ? brickItem->palette().brush(QPalette::Shadow).color()
-                               : QColor(Qt::black);
+    QColor initial =
+        brickItem ? brickItem->palette().brush(QPalette::Shadow).color() : QColor(Qt::black);
 
     const float diameter = plugDiameter(size);
     d->diameter = diameter;
@@ -195,7 +196,8 @@ KrConnectorItem::KrConnectorItem(KrBrickParam* param, KrBrickGraphicsItem* brick
     updateText();
 
     QPolygonF arrow;
-    arrow << QPointF(int(diameter), int(diameter / 4)) << QPointF(int(1.5f * diameter), int(-diameter / 4))
+    arrow << QPointF(int(diameter), int(diameter / 4))
+          << QPointF(int(1.5f * diameter), int(-diameter / 4))
           << QPointF(int(1.5f * diameter), int(diameter / 4))
           << QPointF(int(1.5f * diameter), int(0.75f * diameter));
     d->arrowHead = new QGraphicsPolygonItem(arrow, this);
@@ -210,8 +212,8 @@ KrConnectorItem::KrConnectorItem(KrBrickParam* param, KrBrickGraphicsItem* brick
         if (brickItem && brickItem->scene())
             brickItem->scene()->addItem(d->wire);
     } else if (param) {
-        const QColor window = brickItem ? brickItem->palette().brush(QPalette::Window).color()
-                                        : QColor(Qt::white);
+        const QColor window =
+            brickItem ? brickItem->palette().brush(QPalette::Window).color() : QColor(Qt::white);
         initial = generatedColor(param, window);
     }
 
@@ -456,7 +458,8 @@ QList<KrConnectorItem*> KrConnectorItem::feedingPlugs() const
         if (!brick)
             continue;
         KrBrickGraphicsItem* item = scene->findBrick(brick->getBrickID());
-        KrConnectorItem* plug = item ? item->getConnector(brick->findParameterIndex(other)) : nullptr;
+        KrConnectorItem* plug =
+            item ? item->getConnector(brick->findParameterIndex(other)) : nullptr;
         if (plug)
             plugs.append(plug);
     }

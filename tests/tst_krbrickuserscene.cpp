@@ -1,5 +1,7 @@
 #include "app_testsupport.h"
 #include "krapp.h"
+#include "krbrickfactory.h"
+#include "krbrickfactorymenu.h"
 #include "krbrickframe.h"
 #include "krbrickgraphicsitem.h"
 #include "krbrickgroup.h"
@@ -7,9 +9,14 @@
 #include "krbrickmaterial.h"
 #include "krbrickset.h"
 #include "krbrickuserscene.h"
+#include "krclassfactory.h"
 #include "krconnectoritem.h"
+#include "krcorvanedockwidget.h"
+#include "krcorvanepane.h"
+#include "krmainwindow.h"
 #include "krsettings.h"
 #include "krundo.h"
+#include "pane_testsupport.h"
 #include "scene_testutil.h"
 
 #include <QGraphicsSceneDragDropEvent>
@@ -96,6 +103,7 @@ private slots:
     void groupThreeBricks();
     void groupLeavesRootsOut();
     void contextMenuOnEmptySpace();
+    void contextMenuOfWindow();
     void rightPressKeepsSelection();
     void ctrlDragScrolls();
     void dropFromLibrary_data();
@@ -345,6 +353,14 @@ void TestKrBrickUserScene::arrangeTree()
     int yMax = 148;
     h.scene->arrangeChildren(root, 190, 148, yMax);
     QCOMPARE(yMax, 288);
+
+    // Arranged while its window is not shown yet (as a window opens): no step.
+    undoStack()->undo();
+    h.view->hide();
+    h.scene->autoArrange();
+    QCOMPARE(rootItem->pos(), QPointF(10, 148));
+    QCOMPARE(undoStack()->count(), before + 1);
+    QVERIFY(undoStack()->canRedo());
 }
 
 void TestKrBrickUserScene::arrangeTwoSetsAndLeftToRight()
@@ -628,6 +644,74 @@ void TestKrBrickUserScene::contextMenuOnEmptySpace()
     QCOMPARE(entries, QStringList({"-", "-", "Group", "-", "To Front", "To Back", "-", "Delete"}));
     QCOMPARE(h.scene->getLastMenuPos(), h.view->mapToScene(at));
     QVERIFY(item->isSelected());
+}
+
+void TestKrBrickUserScene::contextMenuOfWindow()
+{
+    KrPaneTestEnv env;
+    auto* pane = new KrCorvanePane;
+    env.mainWindow()->addPane(pane);
+    env.mainWindow()->resize(1400, 900);
+    env.mainWindow()->show();
+    QVERIFY(QTest::qWaitForWindowExposed(env.mainWindow()));
+    KrCorvaneDockWidget* window = pane->getMainWidget()->getCurrentWindow();
+    QVERIFY(window);
+    KrBrickUserScene* scene = window->getBrickScene();
+    QGraphicsView* view = scene->getView();
+    QVERIFY(view);
+    krSceneSettle();
+    // An empty spot of the view.
+    QPoint at;
+    for (int y = view->viewport()->height() - 20; y > 0 && at.isNull(); y -= 20) {
+        for (int x = view->viewport()->width() - 20; x > 0 && at.isNull(); x -= 20) {
+            if (scene->items(view->mapToScene(QPoint(x, y))).isEmpty())
+                at = QPoint(x, y);
+        }
+    }
+    QVERIFY(!at.isNull());
+    const int bricks = scene->getBrickUser()->getBricks().size();
+    QStringList entries;
+    QString added;
+    QTimer::singleShot(50, [&] {
+        auto* menu = qobject_cast<QMenu*>(QApplication::activePopupWidget());
+        if (!menu)
+            return;
+        for (QAction* action : menu->actions())
+            entries << (action->isSeparator() ? QStringLiteral("-") : action->text());
+        // The library's menu is the first entry; choosing a brick kind adds one here.
+        QMenu* library = menu->actions().first()->menu();
+        const QList<KrBrickFactoryAction*> kinds =
+            library ? library->findChildren<KrBrickFactoryAction*>()
+                    : QList<KrBrickFactoryAction*>();
+        for (KrBrickFactoryAction* kind : kinds) {
+            if (kind->m_factory.getFactory() &&
+                kind->m_factory.getFactory()->className() == QLatin1String("KrInvertBrick")) {
+                added = kind->text();
+                kind->trigger();
+                break;
+            }
+        }
+        menu->close();
+    });
+    QContextMenuEvent event(QContextMenuEvent::Mouse, at, view->viewport()->mapToGlobal(at));
+    QApplication::sendEvent(view->viewport(), &event);
+    krSceneSettle();
+    QVERIFY2(entries.size() > 10, qPrintable(entries.join(QLatin1Char('|'))));
+    QCOMPARE(entries.mid(1), QStringList({"-", "Copy", "Cut", "Paste", "-", "Group", "-",
+                                          "To Front", "To Back", "-", "Delete"}));
+    QVERIFY(!added.isEmpty());
+    QCOMPARE(scene->getBrickUser()->getBricks().size(), bricks + 1);
+    KrShaderBrick* brick = scene->getBrickUser()->getBricks().last();
+    QCOMPARE(QString(brick->metaObject()->className()), QStringLiteral("KrInvertBrick"));
+    const QPointF menuPos = view->mapToScene(at);
+    QCOMPARE(scene->findBrick(brick->getBrickID())->pos(),
+             QPointF(int(qMax<qreal>(10, menuPos.x())), int(qMax<qreal>(10, menuPos.y()))));
+    QCOMPARE(krApp->getUndoStack()->undoText(), QStringLiteral("Add Brick"));
+    // The library menu is no longer tied to this scene.
+    const int after = scene->getBrickUser()->getBricks().size();
+    emit pane->getMainWidget()->getBrickMenu()->factoryTriggered(
+        KrBrickFactory(krApp->findClassFactory(QStringLiteral("KrInvertBrick"))));
+    QCOMPARE(scene->getBrickUser()->getBricks().size(), after);
 }
 
 void TestKrBrickUserScene::rightPressKeepsSelection()

@@ -9,6 +9,7 @@
 #include "krundo.h"
 #include "scene_testutil.h"
 
+#include <QColorDialog>
 #include <QGraphicsEllipseItem>
 #include <QGraphicsPolygonItem>
 #include <QGraphicsSceneDragDropEvent>
@@ -105,6 +106,8 @@ private slots:
     void shiftClickRefusedPairMakesNoStep();
     void disconnectMenu();
     void disconnectWithoutWiresLeavesStack();
+    void connectorColorDialog_data();
+    void connectorColorDialog();
     void temporaryWireDirection_data();
     void temporaryWireDirection();
 
@@ -265,10 +268,9 @@ void TestKrConnectorItem::storedColorSurvivesRebuild()
     QVERIFY(rebuilt && rebuilt != plug);
     QCOMPARE(rebuilt->getColor(), QColor(10, 200, 30));
     QCOMPARE(h.plug(p.a, QStringLiteral("out"))->getColor(),
-             KrConnectorItem::generatedColor(p.a->getParameter(0),
-                                             h.scene->findBrick(p.a->getBrickID())
-                                                 ->palette()
-                                                 .color(QPalette::Window)));
+             KrConnectorItem::generatedColor(
+                 p.a->getParameter(0),
+                 h.scene->findBrick(p.a->getBrickID())->palette().color(QPalette::Window)));
 }
 
 void TestKrConnectorItem::wireBelongsToInput_data()
@@ -390,9 +392,12 @@ void TestKrConnectorItem::dropRefused_data()
 {
     QTest::addColumn<QString>("source");
     QTest::addColumn<QString>("target");
-    QTest::newRow("color into float") << "a:col" << "b:in";
-    QTest::newRow("own brick") << "b:res" << "b:in2";
-    QTest::newRow("output on output") << "a:out" << "b:res";
+    QTest::newRow("color into float") << "a:col"
+                                      << "b:in";
+    QTest::newRow("own brick") << "b:res"
+                               << "b:in2";
+    QTest::newRow("output on output") << "a:out"
+                                      << "b:res";
 }
 
 void TestKrConnectorItem::dropRefused()
@@ -504,6 +509,55 @@ void TestKrConnectorItem::disconnectWithoutWiresLeavesStack()
     const int before = undoStack()->count();
     h.plug(p.b, "in")->disconnectParam();
     QCOMPARE(undoStack()->count(), before);
+}
+
+void TestKrConnectorItem::connectorColorDialog_data()
+{
+    QTest::addColumn<bool>("accept");
+    QTest::newRow("chosen") << true;
+    QTest::newRow("cancelled") << false;
+}
+
+void TestKrConnectorItem::connectorColorDialog()
+{
+    QFETCH(bool, accept);
+    KrSceneHarness h;
+    Pair p = makePair(h);
+    QVERIFY(h.scene->connectParameters(p.a->getParameter(0), p.b->getParameter(0)));
+    krSceneSettle();
+    KrConnectorItem* out = h.plug(p.a, "out");
+    const QColor before = out->getColor();
+    const QColor chosen(12, 34, 56);
+    bool handled = false;
+    krOnNextModal(
+        [&](QWidget* modal) {
+            auto* dialog = qobject_cast<QColorDialog*>(modal);
+            QVERIFY(dialog);
+            QCOMPARE(dialog->currentColor(), before);
+            dialog->setCurrentColor(chosen);
+            if (accept)
+                dialog->accept();
+            else
+                dialog->reject();
+        },
+        &handled);
+    QTimer::singleShot(50, [&] {
+        if (auto* menu = qobject_cast<QMenu*>(QApplication::activePopupWidget())) {
+            menu->actions().last()->trigger();
+            menu->close();
+        }
+    });
+    const QPoint at = h.viewPointOf(out);
+    QContextMenuEvent event(QContextMenuEvent::Mouse, at, h.view->viewport()->mapToGlobal(at));
+    QApplication::sendEvent(h.view->viewport(), &event);
+    krSceneSettle();
+    QVERIFY(handled);
+    const QColor expected = accept ? chosen : before;
+    QCOMPARE(out->getColor(), expected);
+    // The wire it feeds takes the colour at once.
+    QCOMPARE(h.plug(p.b, "in")->getWire()->pen().color(), expected);
+    QCOMPARE(p.a->getBrickSettings()->getSettingsValue(QStringLiteral("BrickParams")) != nullptr,
+             accept);
 }
 
 void TestKrConnectorItem::temporaryWireDirection_data()

@@ -125,8 +125,8 @@ QMimeData* krSceneFactoryMime(const QString& className)
     return model.mimeData({model.index(0, 0)});
 }
 
-void krSceneMouse(QGraphicsView* view, QEvent::Type type, const QPoint& pos,
-                  Qt::MouseButton button, Qt::KeyboardModifiers modifiers)
+void krSceneMouse(QGraphicsView* view, QEvent::Type type, const QPoint& pos, Qt::MouseButton button,
+                  Qt::KeyboardModifiers modifiers)
 {
     QWidget* viewport = view->viewport();
     const Qt::MouseButtons held = type == QEvent::MouseButtonRelease ? Qt::NoButton : button;
