@@ -75,14 +75,27 @@ void KrElement::removeProperty(KrProperty* property)
 
 void KrElement::setProperties(const QList<KrProperty*>& properties)
 {
-    for (KrProperty* p : qAsConst(m_properties))
-        disconnect(p, nullptr, this, nullptr);
-    m_properties.clear();
+    // Brick users reset their whole list whenever a brick comes or goes: only rewire the
+    // properties that changed, so large networks stay linear.
+    QSet<KrProperty*> wanted;
+    QList<KrProperty*> list;
+    list.reserve(properties.size());
     for (KrProperty* p : properties) {
-        if (!p || m_properties.contains(p))
-            continue;
-        m_properties.append(p);
-        watch(p);
+        if (p && !wanted.contains(p)) {
+            wanted.insert(p);
+            list.append(p);
+        }
+    }
+    QSet<KrProperty*> had;
+    for (KrProperty* p : qAsConst(m_properties)) {
+        had.insert(p);
+        if (!wanted.contains(p))
+            disconnect(p, nullptr, this, nullptr);
+    }
+    m_properties = list;
+    for (KrProperty* p : qAsConst(m_properties)) {
+        if (!had.contains(p))
+            watch(p);
     }
     emit propertyListChanged();
 }
