@@ -202,8 +202,8 @@ void TestKrConnectorItem::wireCurve_data()
     QTest::addColumn<QPointF>("a");
     QTest::addColumn<QPointF>("c1");
     QTest::addColumn<QPointF>("c2");
-    QTest::newRow("document example")
-        << QPointF(10.7, 20.2) << QPointF(110.2, 20.9) << QPointF(60, 20) << QPointF(60, 20);
+    QTest::newRow("fractions") << QPointF(10.7, 20.2) << QPointF(110.2, 20.9) << QPointF(60, 20)
+                               << QPointF(60, 20);
     QTest::newRow("truncation toward zero")
         << QPointF(-10.7, -5.5) << QPointF(29.9, -5.2) << QPointF(9.5, -5) << QPointF(9.5, -5);
     QTest::newRow("vertical") << QPointF(0, 0) << QPointF(0, 100) << QPointF(50, 0)
