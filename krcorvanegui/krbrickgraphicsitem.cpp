@@ -542,13 +542,18 @@ QVariant KrBrickGraphicsItem::itemChange(GraphicsItemChange change, const QVaria
                                                 KrBrickUserScene::clampPosition(value.toPointF()));
     }
     case ItemPositionHasChanged: {
-        for (KrConnectorItem* plug : qAsConst(d->connectors)) {
-            emit plug->movedInScene();
-            plug->updatePath();
-        }
         setPositionSettings();
-        if (d->scene && d->scene->isMoveLeader(this))
+        if (d->scene && d->scene->isMoveLeader(this)) {
+            // The other selected bricks follow; the wires are drawn once they all moved.
             d->scene->moveFollowers(this, pos() - d->lastPos);
+        } else if (d->scene && d->scene->isBulkLayout()) {
+            d->scene->noteBulkMove(this);
+        } else {
+            for (KrConnectorItem* plug : qAsConst(d->connectors)) {
+                emit plug->movedInScene();
+                plug->updatePath();
+            }
+        }
         break;
     }
     case ItemSelectedHasChanged:

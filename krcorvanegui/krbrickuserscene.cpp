@@ -46,6 +46,8 @@ const qreal kMinPos = 10;
 // Bricks added one after another (opening a network, undoing a large delete) have their
 // posted work carried out in batches: a queue of thousands of posted events slows every post.
 const int kFlushBatch = 64;
+// From this many bricks moved at once, the scene's index is rebuilt rather than updated.
+const int kBulkIndexBricks = 200;
 
 KrUndoStack* sceneUndoStack()
 {
@@ -264,6 +266,10 @@ struct KrBrickUserScene::Private
     QPointer<KrBrickGraphicsItem> moveLeader;
     QMap<uint, QPointF> moveStart;
     bool movingFollowers = false;
+    // Bricks moved together: their wires are redrawn once, at the end.
+    int bulkDepth = 0;
+    QSet<uint> bulkMoved;
+    bool bulkIndexSuspended = false;
     // A resize gesture.
     QPointer<KrBrickGraphicsItem> resizeItem;
     QSize resizeStart;
@@ -814,19 +820,85 @@ void KrBrickUserScene::beginBrickMove(KrBrickGraphicsItem* item, bool othersFoll
 
 bool KrBrickUserScene::isMoveLeader(const KrBrickGraphicsItem* item) const
 {
-    return d->moving && item && d->moveLeader == item && !d->movingFollowers;
+    return d->moving && item && d->moveLeader == item && !d->movingFollowers && !isBulkLayout();
 }
 
 void KrBrickUserScene::moveFollowers(KrBrickGraphicsItem* leader, const QPointF& delta)
 {
-    if (delta.isNull() || d->movingFollowers)
+    if (d->movingFollowers)
         return;
     d->movingFollowers = true;
-    for (KrBrickGraphicsItem* item : getSelectedBricks()) {
-        if (item != leader)
-            item->setPos(item->pos() + delta);
+    // The leader's wires are drawn anew with the followers', once.
+    beginBulkLayout(0);
+    noteBulkMove(leader);
+    if (!delta.isNull()) {
+        for (KrBrickGraphicsItem* item : getSelectedBricks()) {
+            if (item != leader)
+                item->setPos(item->pos() + delta);
+        }
     }
+    endBulkLayout();
     d->movingFollowers = false;
+}
+
+void KrBrickUserScene::beginBulkLayout(int bricks)
+{
+    // Each brick moved through the scene's spatial index costs in proportion to the cells its
+    // items and wires cross: for many bricks the index is set aside and built once afterwards.
+    if (d->bulkDepth++ == 0 && bricks >= kBulkIndexBricks &&
+        itemIndexMethod() == QGraphicsScene::BspTreeIndex) {
+        d->bulkIndexSuspended = true;
+        setItemIndexMethod(QGraphicsScene::NoIndex);
+    }
+}
+
+bool KrBrickUserScene::isBulkLayout() const
+{
+    return d->bulkDepth > 0;
+}
+
+void KrBrickUserScene::noteBulkMove(KrBrickGraphicsItem* item)
+{
+    if (KrShaderBrick* brick = item ? item->getBrick() : nullptr)
+        d->bulkMoved.insert(brick->getBrickID());
+}
+
+void KrBrickUserScene::endBulkLayout()
+{
+    if (d->bulkDepth <= 0 || --d->bulkDepth > 0)
+        return;
+    const QSet<uint> moved = d->bulkMoved;
+    d->bulkMoved.clear();
+    // Every wire touching a moved brick is drawn anew once: a wire redrawn twice before the
+    // scene's index catches up costs a search through everything moved so far.
+    QSet<KrConnectorItem*> inputs;
+    for (uint id : moved) {
+        KrBrickGraphicsItem* item = findBrick(id);
+        if (!item)
+            continue;
+        for (KrConnectorItem* plug : item->getConnectors()) {
+            if (!plug->isOutput()) {
+                inputs.insert(plug);
+                continue;
+            }
+            KrBrickParam* param = plug->getParam();
+            for (int i = 0; param && i < param->getNumConnections(); ++i) {
+                KrBrickParam* other = param->getConnection(i)->getParam();
+                KrShaderBrick* brick = other ? other->getBrick() : nullptr;
+                KrBrickGraphicsItem* consumer = brick ? findBrick(brick->getBrickID()) : nullptr;
+                if (KrConnectorItem* input =
+                        consumer ? consumer->getConnector(brick->findParameterIndex(other))
+                                 : nullptr)
+                    inputs.insert(input);
+            }
+        }
+    }
+    for (KrConnectorItem* input : qAsConst(inputs))
+        input->updatePath();
+    if (d->bulkIndexSuspended) {
+        d->bulkIndexSuspended = false;
+        setItemIndexMethod(QGraphicsScene::BspTreeIndex);
+    }
 }
 
 void KrBrickUserScene::endBrickMove()
@@ -919,6 +991,7 @@ void KrBrickUserScene::arrange()
     IKrBrickUser* user = d->user();
     if (!user)
         return;
+    beginBulkLayout(d->itemsById.size());
     d->arranged.clear();
     d->arranging = true;
     int y = 148; // also the running maximum
@@ -938,6 +1011,7 @@ void KrBrickUserScene::arrange()
     }
     d->arranging = false;
     d->arranged.clear();
+    endBulkLayout();
     if (!d->rightToLeft)
         flipPositions();
 }
@@ -1000,29 +1074,29 @@ void KrBrickUserScene::flipPositions()
             maxW = w;
     }
     const float c = (maxX - minX) * 0.5f;
-    for (KrBrickGraphicsItem* item : qAsConst(d->itemsById)) {
-        const float x = float(item->pos().x());
-        float to = x;
-        if (x < c)
-            to = std::trunc(c + std::trunc(c - x));
-        else if (x > c)
-            to = std::trunc(c - std::trunc(x - c));
-        if (to < kMinPos)
-            to = kMinPos;
-        item->setPos(to, item->pos().y());
-    }
     float shift = -minX;
     if (d->rightToLeft) {
         const QRectF area = d->view ? d->view->sceneRect() : sceneRect();
         shift = float(area.width()) - maxX - maxW;
     }
+    // Mirrored about the middle, then shifted: each brick moves once.
+    beginBulkLayout(d->itemsById.size());
     for (KrBrickGraphicsItem* item : qAsConst(d->itemsById)) {
-        float to = std::trunc(float(item->pos().x()) + shift);
+        const float x = float(item->pos().x());
+        float mirrored = x;
+        if (x < c)
+            mirrored = std::trunc(c + std::trunc(c - x));
+        else if (x > c)
+            mirrored = std::trunc(c - std::trunc(x - c));
+        if (mirrored < kMinPos)
+            mirrored = kMinPos;
+        float to = std::trunc(mirrored + shift);
         if (to < kMinPos)
             to = kMinPos;
         item->setPos(to, item->pos().y());
         item->setPositionSettings();
     }
+    endBulkLayout();
     if (d->view)
         d->view->ensureVisible(d->itemsById.first(), 50, 50);
 }
@@ -1466,6 +1540,7 @@ void KrBrickLayoutUndoItem::apply(bool after)
         return;
     const int i = after ? 1 : 0;
     IKrBrickUser* user = scene->getBrickUser();
+    scene->beginBulkLayout(m_changes.size());
     for (auto it = m_changes.cbegin(); it != m_changes.cend(); ++it) {
         const Change& change = it.value();
         KrBrickGraphicsItem* item = scene->findBrick(it.key());
@@ -1489,6 +1564,7 @@ void KrBrickLayoutUndoItem::apply(bool after)
         if (change.hasZ && item)
             item->setZValue(change.z[i]);
     }
+    scene->endBulkLayout();
     if (m_hasDirection)
         scene->applyDirection(m_direction[i]);
 }

@@ -104,6 +104,12 @@ public:
 
     // Positions and layout without undo, for the undo items.
     void applyDirection(bool rightToLeft);
+    // Bricks moved between begin and end have their wires redrawn once, at the end; bricks
+    // is about how many will move.
+    void beginBulkLayout(int bricks);
+    void endBulkLayout();
+    bool isBulkLayout() const;
+    void noteBulkMove(KrBrickGraphicsItem* item);
 
     void registerUndoItem(KrBrickSceneUndoItem* item);
     void unregisterUndoItem(KrBrickSceneUndoItem* item);

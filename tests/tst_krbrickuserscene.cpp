@@ -95,6 +95,7 @@ private slots:
     void arrangeTree();
     void arrangeTwoSetsAndLeftToRight();
     void arrangeSharedFeedersOnce();
+    void arrangeManyKeepsSceneSearchable();
     void flipStaysInside_data();
     void flipStaysInside();
     void flipWithDirectionIsOneStep();
@@ -341,7 +342,16 @@ void TestKrBrickUserScene::arrangeTree()
     QCOMPARE(grandItem->pos(), QPointF(340, 148));
     QCOMPARE(undoStack()->count(), before + 1);
     QCOMPARE(undoStack()->undoText(), QStringLiteral("Auto Arrange"));
+    // The wires followed the bricks they join.
+    auto wireJoins = [&](KrShaderBrick* consumer, const char* in, KrShaderBrick* feeder) {
+        KrConnectorItem* input = h.plug(consumer, in);
+        return input && input->getWire()->path().pointAtPercent(1) ==
+                            h.plug(feeder, "out")->getConnectPoint();
+    };
+    QVERIFY(wireJoins(root, "x", first));
+    QVERIFY(wireJoins(second, "in", grand));
     undoStack()->undo();
+    QVERIFY(wireJoins(root, "y", second));
     QCOMPARE(rootItem->pos(), QPointF(600, 600));
     QCOMPARE(grandItem->pos(), QPointF(600, 600));
     QCOMPARE(grand->getBrickSettings()->getFloatValue(QStringLiteral("PosX")), 600.0);
@@ -423,6 +433,39 @@ void TestKrBrickUserScene::arrangeSharedFeedersOnce()
     for (KrBrickGraphicsItem* item : qAsConst(items))
         places.insert(qMakePair(item->pos().x(), item->pos().y()));
     QCOMPARE(places.size(), items.size());
+}
+
+void TestKrBrickUserScene::arrangeManyKeepsSceneSearchable()
+{
+    KrSceneHarness h;
+    auto* root = new KrSceneTestBrick(QStringLiteral("Root"), 1);
+    root->addInput(QStringLiteral("in"));
+    h.add(root, QPointF(10, 10));
+    KrShaderBrick* consumer = root;
+    QList<KrBrickGraphicsItem*> items;
+    for (int i = 0; i < 220; ++i) {
+        KrSceneTestBrick* brick = chainBrick(QStringLiteral("B%1").arg(i));
+        items << h.scene->addBrickAt(brick, QPointF(10 + (i % 20) * 50, 10 + (i / 20) * 40));
+        QVERIFY(consumer->addConnection(0, brick, 1));
+        consumer = brick;
+    }
+    krSceneSettle();
+    h.scene->autoArrange();
+    h.scene->flipBricksAboutCenter();
+    krSceneSettle();
+    QCOMPARE(h.scene->itemIndexMethod(), QGraphicsScene::BspTreeIndex);
+    // Every brick is found where it now is, and its wire reaches its consumer.
+    for (KrBrickGraphicsItem* item : qAsConst(items)) {
+        const QPointF inside = item->mapToScene(item->rect().center());
+        QVERIFY(h.scene->items(inside).contains(item));
+    }
+    KrConnectorItem* last = h.plug(items.at(218)->getBrick(), QStringLiteral("in"));
+    QCOMPARE(last->getWire()->path().pointAtPercent(1),
+             h.plug(items.at(219)->getBrick(), QStringLiteral("out"))->getConnectPoint());
+    undoStack()->undo();
+    undoStack()->undo();
+    for (int i = 0; i < items.size(); i += 37)
+        QCOMPARE(items.at(i)->pos(), QPointF(10 + (i % 20) * 50, 10 + (i / 20) * 40));
 }
 
 void TestKrBrickUserScene::flipStaysInside_data()
