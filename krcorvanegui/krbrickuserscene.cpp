@@ -36,6 +36,7 @@
 #include <QTimer>
 
 #include <cmath>
+#include <memory>
 
 namespace {
 const QString kPosX = QStringLiteral("PosX");
@@ -61,6 +62,29 @@ bool canRecord()
     KrUndoStack* stack = sceneUndoStack();
     return stack && stack->canPushItems();
 }
+
+// Holds back the brick user's exposed-property rebuild while many bricks come and go: it is
+// made once at the end instead of once per brick.
+class BrickBatch
+{
+public:
+    explicit BrickBatch(IKrBrickUser* user)
+        : m_container(user ? user->getBrickContainer() : nullptr)
+    {
+        if (m_container)
+            m_container->beginBatch();
+    }
+    ~BrickBatch()
+    {
+        if (m_container)
+            m_container->endBatch();
+    }
+    BrickBatch(const BrickBatch&) = delete;
+    BrickBatch& operator=(const BrickBatch&) = delete;
+
+private:
+    QPointer<KrBrickContainer> m_container;
+};
 
 void pushStep(KrUndoItem* item, const QString& text)
 {
@@ -280,6 +304,8 @@ struct KrBrickUserScene::Private
     bool arranging = false;
     // A flip whose step also takes the direction change that comes right after it.
     KrBrickLayoutUndoItem* flipAwaitingDirection = nullptr;
+    // Open while the undo stack replays a step.
+    std::unique_ptr<BrickBatch> replayBatch;
 
     IKrBrickUser* user() const { return userObject ? brickUser : nullptr; }
 };
@@ -308,6 +334,12 @@ KrBrickUserScene::KrBrickUserScene(IKrBrickUser* brickUser, QGraphicsView* view,
         connect(object, SIGNAL(brickRemoved(KrShaderBrick*)), this,
                 SLOT(brickRemoved(KrShaderBrick*)));
         connect(object, SIGNAL(brickAdded(KrShaderBrick*)), this, SLOT(updateBricks()));
+    }
+    if (KrUndoStack* stack = sceneUndoStack()) {
+        // Undoing a large delete files its bricks one by one.
+        connect(stack, &KrUndoStack::replayStarted, this,
+                [this] { d->replayBatch.reset(new BrickBatch(d->user())); });
+        connect(stack, &KrUndoStack::replayFinished, this, [this] { d->replayBatch.reset(); });
     }
 }
 
@@ -603,6 +635,7 @@ void KrBrickUserScene::deleteSelected()
     if (items.isEmpty())
         return;
     KrUndoStackHold hold;
+    BrickBatch batch(d->user());
     for (KrBrickGraphicsItem* item : items)
         removeBrickItem(item);
     hold.accept(QStringLiteral("Delete Bricks"));
@@ -636,6 +669,7 @@ void KrBrickUserScene::toGroup()
     KrBrickGraphicsItem* groupItem = nullptr;
     {
         KrUndoStackHold hold;
+        BrickBatch batch(user);
         // Wires from grouped bricks to bricks left outside; the group's outputs take them.
         QList<QPair<KrBrickParam*, KrBrickParam*>> outgoing;
         for (KrBrickGraphicsItem* item : qAsConst(grouped)) {

@@ -126,6 +126,8 @@ public slots:
     void followPathEnd();
     void updateBricks();
     void autoArrange();
+    // Lays the bricks out as autoArrange() does, but as part of setting a window up: no step.
+    void arrange();
     void arrangeChildren(KrShaderBrick* brick, int xOffset, int yOffset, int& yMax);
     bool isConnectMode();
     void setConnectMode(bool onOff, KrConnectorItem* item = nullptr, QPointF pos = QPointF(),
@@ -161,7 +163,6 @@ private:
     // Runs change and records what it did to the bricks' positions and depths as one step.
     KrBrickLayoutUndoItem* layoutAsStep(const QString& text, const std::function<void()>& change);
     void flipPositions();
-    void arrange();
     void flushPostedWork();
 
     friend class KrBrickDeleteUndoItem;

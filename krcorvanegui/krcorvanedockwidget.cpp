@@ -133,7 +133,7 @@ KrCorvaneDockWidget::KrCorvaneDockWidget(IKrBrickUser* user, KrCorvanePaneMainWg
             KrSettings* settings = root->getBrickSettings();
             // A request to arrange is carried out once.
             if (settings->getBoolValue(QStringLiteral("AutoArrange"), false)) {
-                d->scene->autoArrange();
+                d->scene->arrange();
                 settings->removeValue(QStringLiteral("AutoArrange"));
             }
         }

@@ -211,7 +211,7 @@ KrCorvanePaneMainWgt::KrCorvanePaneMainWgt(KrCorvanePane* pane)
     if (!d->kinds().isEmpty()) {
         if (IKrBrickUser* material = newDefaultBrickMaterial()) {
             KrCorvaneDockWidget* window = newWindow(material);
-            window->getBrickScene()->autoArrange();
+            window->getBrickScene()->arrange();
         }
     }
 }
@@ -418,7 +418,7 @@ KrCorvaneDockWidget* KrCorvanePaneMainWgt::newWindow()
     user->setName(uniqueBrickUserName(name));
 
     KrCorvaneDockWidget* window = newWindow(user);
-    window->getBrickScene()->autoArrange();
+    window->getBrickScene()->arrange();
     return window;
 }
 

@@ -67,6 +67,14 @@ private:
 };
 } // namespace
 
+namespace {
+// A wired advanced parameter stays: its wire must end somewhere.
+bool listsParam(const KrBrickParam* param, bool hideAdvanced)
+{
+    return !(param->getIsAdvanced() && hideAdvanced && param->getNumConnections() < 1);
+}
+} // namespace
+
 struct KrStandardBrickWidget::Private
 {
     QPointer<KrShaderBrick> brick;
@@ -117,6 +125,25 @@ void KrStandardBrickWidget::setBrick(KrShaderBrick* brick)
         connect(brick, &KrShaderBrick::paramRemoved, this, &KrStandardBrickWidget::paramChange);
         connect(brick, &KrShaderBrick::connectionsChanged, this,
                 &KrBrickOptionsFrame::updateConnections);
+        connect(brick, &KrShaderBrick::connectionsChanged, this,
+                &KrStandardBrickWidget::connectionsChanged);
+    }
+}
+
+void KrStandardBrickWidget::connectionsChanged()
+{
+    // A hidden advanced parameter that gets a wire (a paste, an undone disconnect) must be
+    // listed to carry it, and one that loses its last wire goes back out of sight.
+    KrShaderBrick* brick = d->brick;
+    if (!brick || !hidesAdvanced())
+        return;
+    for (QListIterator<KrBrickParam*> it = brick->getParameterIterator(); it.hasNext();) {
+        KrBrickParam* param = it.next();
+        if (param && param->getIsAdvanced() &&
+            listsParam(param, true) != d->paramWidgets.contains(param)) {
+            paramChange();
+            return;
+        }
     }
 }
 
@@ -210,8 +237,7 @@ void KrStandardBrickWidget::addParams(int direction, KrWidgetGroup*& group, cons
         KrBrickParam* param = it.next();
         if (!param || param->getDirection() != direction)
             continue;
-        // A wired advanced parameter stays: its wire must end somewhere.
-        if (param->getIsAdvanced() && hideAdvanced && param->getNumConnections() < 1)
+        if (!listsParam(param, hideAdvanced))
             continue;
         if (!group)
             group = makeGroup(title, title + QStringLiteral("Group"));

@@ -40,6 +40,7 @@ private slots:
     void resetLayout(bool updateParent);
     void collapsedFired();
     void paramChange();
+    void connectionsChanged();
     void promptForLabel();
 
 protected:

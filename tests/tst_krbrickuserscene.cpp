@@ -22,6 +22,7 @@
 #include <QGraphicsSceneDragDropEvent>
 #include <QMenu>
 #include <QMimeData>
+#include <QSignalSpy>
 #include <QStandardItemModel>
 #include <QtTest>
 #include <memory>
@@ -229,8 +230,11 @@ void TestKrBrickUserScene::deleteSelectedIsOneStep()
     const QString record = krSceneRecord(h.user);
     const int before = undoStack()->count();
 
+    // Views of the brick user's properties are told once per step, not once per brick.
+    QSignalSpy exposed(h.user->getBrickContainer(), &KrBrickContainer::exposedPropertiesChanged);
     selectOnly(h.scene, {a, b, c});
     invoke(h.scene, "deleteSelected");
+    QCOMPARE(exposed.count(), 1);
     QCOMPARE(h.scene->getItemsById().size(), 1);
     QCOMPARE(h.user->getBricks().size(), 1);
     QCOMPARE(kept->getParameter(0)->getNumConnections(), 0);
@@ -239,7 +243,9 @@ void TestKrBrickUserScene::deleteSelectedIsOneStep()
     // The focus went to the scene's holder, away from the deleted bricks.
     QCOMPARE(h.scene->focusItem(), h.scene->getFocusHolder());
 
+    exposed.clear();
     undoStack()->undo();
+    QCOMPARE(exposed.count(), 1);
     krSceneSettle();
     for (uint id : ids)
         QVERIFY(h.scene->findBrick(id));

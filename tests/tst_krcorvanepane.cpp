@@ -19,6 +19,7 @@
 #include "krpreviewnode.h"
 #include "krsettings.h"
 #include "krshaderbrick.h"
+#include "krundo.h"
 #include "pane_testsupport.h"
 
 #include "krproperty.h"
@@ -386,6 +387,8 @@ void TestKrCorvanePane::renameThroughPreferencesFollowsTab()
 
 void TestKrCorvanePane::newWindowsGetUniqueNames()
 {
+    QVERIFY(krUndoStack);
+    const int steps = krUndoStack->count();
     for (int i = 0; i < 3; ++i) {
         QString proposal;
         pnAnswerModals({chooserAnswer(0, QStringLiteral("Mat"), true, &proposal)});
@@ -399,6 +402,8 @@ void TestKrCorvanePane::newWindowsGetUniqueNames()
     QCOMPARE(tabs->tabText(2), QStringLiteral("Mat_0"));
     QCOMPARE(tabs->tabText(3), QStringLiteral("Mat_1"));
     QCOMPARE(main()->getCurrentWindow(), main()->getOpenWindows().last());
+    // Laying out a new window is no edit: nothing to undo.
+    QCOMPARE(krUndoStack->count(), steps);
 
     // A new material starts from the default material's network, arranged.
     IKrBrickUser* user = main()->getOpenWindows().last()->getBrickUser();

@@ -85,6 +85,7 @@ private slots:
     void rowsInDirectionOrder();
     void parameterWithPropertiesIsCollapsedSubGroup();
     void advancedParameters();
+    void advancedParameterFollowsItsWires();
     void missingWidgets();
     void rebuildCoalescing();
     void paramYPositionInsideRow();
@@ -239,6 +240,38 @@ void TestKrStandardBrickWidget::advancedParameters()
     QVERIFY(!widget.getParamWidget(loose)); // queued
     QCoreApplication::processEvents();
     QVERIFY(widget.getParamWidget(loose));
+}
+
+void TestKrStandardBrickWidget::advancedParameterFollowsItsWires()
+{
+    KrFrameTestBrick brick;
+    KrBrickParam* advanced = brick.addPlain(QStringLiteral("a"), QStringLiteral("Adv"), 1, true);
+    KrFrameTestBrick source(QStringLiteral("Source"), 4);
+    KrBrickParam* out = source.addPlain(QStringLiteral("o"), QStringLiteral("Out"), 2);
+
+    KrStandardBrickWidget widget;
+    widget.setBrick(&brick);
+    QVERIFY(!widget.getParamWidget(advanced));
+
+    // A wire made without the plug in view (a paste, an undone disconnect) lists it.
+    QVERIFY(advanced->addConnection(out));
+    QCoreApplication::processEvents();
+    QVERIFY(widget.getParamWidget(advanced));
+    QVERIFY(widget.getParamYPosition(advanced) >= 0);
+
+    advanced->removeAllConnections();
+    QCoreApplication::processEvents();
+    QVERIFY(!widget.getParamWidget(advanced));
+
+    // With advanced parameters shown a wire changes nothing.
+    widget.setHideAdvanced(false);
+    QCoreApplication::processEvents();
+    RebuildCounter counter;
+    widget.installEventFilter(&counter);
+    QVERIFY(advanced->addConnection(out));
+    QCoreApplication::processEvents();
+    QCOMPARE(counter.rebuilds, 0);
+    QVERIFY(widget.getParamWidget(advanced));
 }
 
 void TestKrStandardBrickWidget::missingWidgets()

@@ -68,6 +68,7 @@ private slots:
     void nestedHolds_data();
     void nestedHolds();
     void pushDuringUndoIsRefused();
+    void replayIsAnnouncedOnce();
     void redoDoesNotRecordASecondStep();
     void holdOpenedDuringReplayMakesNothing();
     void clearDuringReplayWaits();
@@ -264,6 +265,34 @@ void TestKrUndoStack::pushDuringUndoIsRefused()
     QVERIFY(stack.canRedo()); // an echo step would have dropped the redo
     stack.redo();
     QCOMPARE(stack.index(), 2);
+}
+
+void TestKrUndoStack::replayIsAnnouncedOnce()
+{
+    KrUndoStack stack;
+    QSignalSpy started(&stack, &KrUndoStack::replayStarted);
+    QSignalSpy finished(&stack, &KrUndoStack::replayFinished);
+    QStringList seen;
+    connect(&stack, &KrUndoStack::replayStarted, [&] { seen << "started"; });
+    connect(&stack, &KrUndoStack::replayFinished, [&] { seen << "finished"; });
+    {
+        KrUndoStackHold hold;
+        for (const char* name : {"a", "b", "c"}) {
+            auto* item = new LogItem(name);
+            item->onUndo = [&seen, name] { seen << QString("undo ") + name; };
+            stack.push(item);
+        }
+        hold.accept("Three");
+    }
+    QCOMPARE(started.count(), 0); // pushing replays nothing
+
+    stack.undo();
+    QCOMPARE(seen, QStringList({"started", "undo c", "undo b", "undo a", "finished"}));
+    stack.redo();
+    QCOMPARE(started.count(), 2);
+    QCOMPARE(finished.count(), 2);
+    stack.redo(); // nothing to redo
+    QCOMPARE(started.count(), 2);
 }
 
 void TestKrUndoStack::redoDoesNotRecordASecondStep()

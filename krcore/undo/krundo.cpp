@@ -16,6 +16,7 @@ namespace {
 struct ReplayCounter
 {
     int depth = 0;
+    KrUndoStack* owner = nullptr;
 };
 
 int s_replaying = 0; // replays under way in any stack
@@ -25,13 +26,15 @@ class Replay
 public:
     explicit Replay(ReplayCounter* counter) : m_counter(counter)
     {
-        ++m_counter->depth;
         ++s_replaying;
+        if (m_counter->depth++ == 0 && m_counter->owner)
+            emit m_counter->owner->replayStarted();
     }
     ~Replay()
     {
-        --m_counter->depth;
         --s_replaying;
+        if (--m_counter->depth == 0 && m_counter->owner)
+            emit m_counter->owner->replayFinished();
     }
 
 private:
@@ -133,6 +136,7 @@ KrUndoStack::KrUndoStack(QObject* parent) : QObject(parent), d(new Private)
 {
     if (!krUndoStack)
         krUndoStack = this;
+    d->replay.owner = this;
     connect(&d->stack, &QUndoStack::indexChanged, this, &KrUndoStack::indexChanged);
     connect(&d->stack, &QUndoStack::cleanChanged, this, &KrUndoStack::cleanChanged);
 }

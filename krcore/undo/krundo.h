@@ -62,6 +62,10 @@ public slots:
 signals:
     void indexChanged(int index);
     void cleanChanged(bool clean);
+    // Around each outermost undo or redo of a step: listeners can hold back work that a
+    // step of many items would otherwise repeat per item.
+    void replayStarted();
+    void replayFinished();
 
 private:
     friend class KrUndoStackHold;
