@@ -175,6 +175,8 @@ struct KrBrickFrame::Private
     KrTabBarOptionsBtn* optionsButton = nullptr;
     KrBrickBar* brickBar = nullptr;
     QPointer<KrShaderBrick> brick;
+    // The key this frame is listed under among the live frames (the brick may be gone).
+    KrShaderBrick* listedUnder = nullptr;
     KrBrickOptionsFrame* optionFrame = nullptr;
     QMenu* brickMenu = nullptr;
     QAction* hideParamsAction = nullptr;
@@ -299,6 +301,7 @@ KrBrickFrame::KrBrickFrame(KrShaderBrick* brick, KrBrickGraphicsItem* item, QWid
 
     if (brick) {
         liveFrames().insert(brick, this);
+        d->listedUnder = brick;
         // A later brick at the same address must not find this frame.
         connect(brick, &QObject::destroyed, this, [this, brick] {
             if (liveFrames().value(brick) == this)
@@ -317,12 +320,9 @@ KrBrickFrame::KrBrickFrame(KrShaderBrick* brick, KrBrickGraphicsItem* item, QWid
 KrBrickFrame::~KrBrickFrame()
 {
     QHash<KrShaderBrick*, KrBrickFrame*>& frames = liveFrames();
-    for (auto it = frames.begin(); it != frames.end();) {
-        if (it.value() == this)
-            it = frames.erase(it);
-        else
-            ++it;
-    }
+    const auto it = frames.find(d->listedUnder);
+    if (it != frames.end() && it.value() == this)
+        frames.erase(it);
 }
 
 KrBrickFrame* KrBrickFrame::findFrame(KrShaderBrick* brick)

@@ -47,8 +47,8 @@ const qreal kMinPos = 10;
 // Bricks added one after another (opening a network, undoing a large delete) have their
 // posted work carried out in batches: a queue of thousands of posted events slows every post.
 const int kFlushBatch = 64;
-// From this many bricks moved at once, the scene's index is rebuilt rather than updated.
-const int kBulkIndexBricks = 200;
+// Space between bricks stacked by an arrangement.
+const int kArrangeGap = 20;
 
 KrUndoStack* sceneUndoStack()
 {
@@ -293,7 +293,6 @@ struct KrBrickUserScene::Private
     // Bricks moved together: their wires are redrawn once, at the end.
     int bulkDepth = 0;
     QSet<uint> bulkMoved;
-    bool bulkIndexSuspended = false;
     // A resize gesture.
     QPointer<KrBrickGraphicsItem> resizeItem;
     QSize resizeStart;
@@ -306,14 +305,34 @@ struct KrBrickUserScene::Private
     KrBrickLayoutUndoItem* flipAwaitingDirection = nullptr;
     // Open while the undo stack replays a step.
     std::unique_ptr<BrickBatch> replayBatch;
+    QPointer<KrUndoStack> watchedStack;
 
     IKrBrickUser* user() const { return userObject ? brickUser : nullptr; }
+
+    // Undoing a large delete files its bricks one by one: the brick user's rebuild waits for
+    // the end of the step. The stack may come into being after the scene.
+    void watchUndoStack(KrBrickUserScene* scene)
+    {
+        KrUndoStack* stack = sceneUndoStack();
+        if (!stack || stack == watchedStack)
+            return;
+        if (watchedStack)
+            QObject::disconnect(watchedStack, nullptr, scene, nullptr);
+        watchedStack = stack;
+        QObject::connect(stack, &KrUndoStack::replayStarted, scene,
+                         [this] { replayBatch.reset(new BrickBatch(user())); });
+        QObject::connect(stack, &KrUndoStack::replayFinished, scene,
+                         [this] { replayBatch.reset(); });
+    }
 };
 
 KrBrickUserScene::KrBrickUserScene(IKrBrickUser* brickUser, QGraphicsView* view,
                                    KrCorvaneDockWidget* dockWindow)
     : QGraphicsScene(nullptr), d(new Private)
 {
+    // Bricks move all the time and wires can span the whole network: a spatial index would
+    // be updated on every move and searched through long wires on every removal.
+    setItemIndexMethod(QGraphicsScene::NoIndex);
     registerFactoryType();
     d->brickUser = brickUser;
     if (brickUser) {
@@ -335,12 +354,7 @@ KrBrickUserScene::KrBrickUserScene(IKrBrickUser* brickUser, QGraphicsView* view,
                 SLOT(brickRemoved(KrShaderBrick*)));
         connect(object, SIGNAL(brickAdded(KrShaderBrick*)), this, SLOT(updateBricks()));
     }
-    if (KrUndoStack* stack = sceneUndoStack()) {
-        // Undoing a large delete files its bricks one by one.
-        connect(stack, &KrUndoStack::replayStarted, this,
-                [this] { d->replayBatch.reset(new BrickBatch(d->user())); });
-        connect(stack, &KrUndoStack::replayFinished, this, [this] { d->replayBatch.reset(); });
-    }
+    d->watchUndoStack(this);
 }
 
 KrBrickUserScene::~KrBrickUserScene()
@@ -520,7 +534,14 @@ void KrBrickUserScene::flushPostedWork()
     if (++d->addsSinceFlush < kFlushBatch)
         return;
     d->addsSinceFlush = 0;
+    // The window is not painted half-built: each flush would paint everything added so far.
+    QWidget* window = d->view ? d->view->window() : nullptr;
+    const bool holdPaint = window && window->updatesEnabled();
+    if (holdPaint)
+        window->setUpdatesEnabled(false);
     QCoreApplication::sendPostedEvents();
+    if (holdPaint)
+        window->setUpdatesEnabled(true);
 }
 
 void KrBrickUserScene::updateBricks()
@@ -863,7 +884,7 @@ void KrBrickUserScene::moveFollowers(KrBrickGraphicsItem* leader, const QPointF&
         return;
     d->movingFollowers = true;
     // The leader's wires are drawn anew with the followers', once.
-    beginBulkLayout(0);
+    beginBulkLayout();
     noteBulkMove(leader);
     if (!delta.isNull()) {
         for (KrBrickGraphicsItem* item : getSelectedBricks()) {
@@ -875,15 +896,9 @@ void KrBrickUserScene::moveFollowers(KrBrickGraphicsItem* leader, const QPointF&
     d->movingFollowers = false;
 }
 
-void KrBrickUserScene::beginBulkLayout(int bricks)
+void KrBrickUserScene::beginBulkLayout()
 {
-    // Each brick moved through the scene's spatial index costs in proportion to the cells its
-    // items and wires cross: for many bricks the index is set aside and built once afterwards.
-    if (d->bulkDepth++ == 0 && bricks >= kBulkIndexBricks &&
-        itemIndexMethod() == QGraphicsScene::BspTreeIndex) {
-        d->bulkIndexSuspended = true;
-        setItemIndexMethod(QGraphicsScene::NoIndex);
-    }
+    ++d->bulkDepth;
 }
 
 bool KrBrickUserScene::isBulkLayout() const
@@ -929,10 +944,6 @@ void KrBrickUserScene::endBulkLayout()
     }
     for (KrConnectorItem* input : qAsConst(inputs))
         input->updatePath();
-    if (d->bulkIndexSuspended) {
-        d->bulkIndexSuspended = false;
-        setItemIndexMethod(QGraphicsScene::BspTreeIndex);
-    }
 }
 
 void KrBrickUserScene::endBrickMove()
@@ -1025,10 +1036,11 @@ void KrBrickUserScene::arrange()
     IKrBrickUser* user = d->user();
     if (!user)
         return;
-    beginBulkLayout(d->itemsById.size());
+    beginBulkLayout();
     d->arranged.clear();
     d->arranging = true;
-    int y = 148; // also the running maximum
+    // Each tree goes below the one before it.
+    int y = 148;
     for (int i = 0; i < user->getNumBrickSets(); ++i) {
         KrBrickSet* set = user->getBrickSet(i);
         KrShaderBrick* root = set ? set->getRoot() : nullptr;
@@ -1039,9 +1051,9 @@ void KrBrickUserScene::arrange()
         item->setPos(10, y);
         d->arranged.insert(root);
         const int xChild = 10 + int(1.5 * frame->width());
-        if (frame->height() > y)
-            y = frame->height();
-        arrangeChildren(root, xChild, y, y);
+        int bottom = y + frame->height() + kArrangeGap;
+        arrangeChildren(root, xChild, y, bottom);
+        y = bottom;
     }
     d->arranging = false;
     d->arranged.clear();
@@ -1071,10 +1083,13 @@ void KrBrickUserScene::arrangeChildren(KrShaderBrick* brick, int xOffset, int yO
         d->arranged.insert(child);
         item->setPos(xOffset, y);
         const int xChild = xOffset + int(1.5 * frame->width());
-        y += frame->height() + 20;
+        // A child's own feeders start level with it, and the next child goes below the lower
+        // of the two: no subtree lands on another.
+        int bottom = y + frame->height() + kArrangeGap;
+        arrangeChildren(child, xChild, y, bottom);
+        y = bottom;
         if (y > yMax)
             yMax = y;
-        arrangeChildren(child, xChild, yOffset, yMax);
     }
     --d->arrangeDepth;
 }
@@ -1114,7 +1129,7 @@ void KrBrickUserScene::flipPositions()
         shift = float(area.width()) - maxX - maxW;
     }
     // Mirrored about the middle, then shifted: each brick moves once.
-    beginBulkLayout(d->itemsById.size());
+    beginBulkLayout();
     for (KrBrickGraphicsItem* item : qAsConst(d->itemsById)) {
         const float x = float(item->pos().x());
         float mirrored = x;
@@ -1155,8 +1170,10 @@ void KrBrickUserScene::toBack()
 
 void KrBrickUserScene::registerUndoItem(KrBrickSceneUndoItem* item)
 {
-    if (item && !d->destroying)
+    if (item && !d->destroying) {
         d->undoItems.insert(item);
+        d->watchUndoStack(this);
+    }
 }
 
 void KrBrickUserScene::unregisterUndoItem(KrBrickSceneUndoItem* item)
@@ -1574,7 +1591,7 @@ void KrBrickLayoutUndoItem::apply(bool after)
         return;
     const int i = after ? 1 : 0;
     IKrBrickUser* user = scene->getBrickUser();
-    scene->beginBulkLayout(m_changes.size());
+    scene->beginBulkLayout();
     for (auto it = m_changes.cbegin(); it != m_changes.cend(); ++it) {
         const Change& change = it.value();
         KrBrickGraphicsItem* item = scene->findBrick(it.key());

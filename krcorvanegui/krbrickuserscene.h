@@ -104,9 +104,8 @@ public:
 
     // Positions and layout without undo, for the undo items.
     void applyDirection(bool rightToLeft);
-    // Bricks moved between begin and end have their wires redrawn once, at the end; bricks
-    // is about how many will move.
-    void beginBulkLayout(int bricks);
+    // Bricks moved between begin and end have their wires redrawn once, at the end.
+    void beginBulkLayout();
     void endBulkLayout();
     bool isBulkLayout() const;
     void noteBulkMove(KrBrickGraphicsItem* item);

@@ -22,6 +22,7 @@
 #include <QGraphicsSceneDragDropEvent>
 #include <QMenu>
 #include <QMimeData>
+#include <QRandomGenerator>
 #include <QSignalSpy>
 #include <QStandardItemModel>
 #include <QtTest>
@@ -96,6 +97,8 @@ private slots:
     void arrangeTree();
     void arrangeTwoSetsAndLeftToRight();
     void arrangeSharedFeedersOnce();
+    void arrangedBricksDoNotOverlap_data();
+    void arrangedBricksDoNotOverlap();
     void arrangeManyKeepsSceneSearchable();
     void flipStaysInside_data();
     void flipStaysInside();
@@ -344,8 +347,8 @@ void TestKrBrickUserScene::arrangeTree()
     QCOMPARE(rootItem->pos(), QPointF(10, 148));
     QCOMPARE(firstItem->pos(), QPointF(190, 148));
     QCOMPARE(secondItem->pos(), QPointF(190, 228));
-    // Grandchildren start at their parent's own first row.
-    QCOMPARE(grandItem->pos(), QPointF(340, 148));
+    // A brick's feeders start level with it.
+    QCOMPARE(grandItem->pos(), QPointF(340, 228));
     QCOMPARE(undoStack()->count(), before + 1);
     QCOMPARE(undoStack()->undoText(), QStringLiteral("Auto Arrange"));
     // The wires followed the bricks they join.
@@ -391,16 +394,17 @@ void TestKrBrickUserScene::arrangeTwoSetsAndLeftToRight()
     KrBrickGraphicsItem* childItem = sizedBrick(h, child, QSize(100, 50), QPointF(700, 700));
     QVERIFY(root2->addConnection(0, child, 1));
     h.scene->autoArrange();
+    // The second tree goes below the first.
     QCOMPARE(item1->pos(), QPointF(10, 148));
-    QCOMPARE(item2->pos(), QPointF(10, 148));
-    QCOMPARE(childItem->pos(), QPointF(190, 148));
+    QCOMPARE(item2->pos(), QPointF(10, 268));
+    QCOMPARE(childItem->pos(), QPointF(190, 268));
 
     // Left to right: the arrangement ends mirrored, roots to the right of their children.
     h.scene->setIsRightToLeft(false);
     h.scene->autoArrange();
     QVERIFY(item2->pos().x() > childItem->pos().x());
     QVERIFY(childItem->pos().x() >= 10);
-    QCOMPARE(item2->pos().y(), 148.0);
+    QCOMPARE(item2->pos().y(), 268.0);
 }
 
 void TestKrBrickUserScene::arrangeSharedFeedersOnce()
@@ -441,6 +445,60 @@ void TestKrBrickUserScene::arrangeSharedFeedersOnce()
     QCOMPARE(places.size(), items.size());
 }
 
+void TestKrBrickUserScene::arrangedBricksDoNotOverlap_data()
+{
+    QTest::addColumn<quint32>("seed");
+    QTest::addColumn<int>("count");
+    QTest::newRow("bushy") << 7u << 40;
+    QTest::newRow("deep") << 11u << 60;
+    QTest::newRow("wide") << 23u << 80;
+}
+
+void TestKrBrickUserScene::arrangedBricksDoNotOverlap()
+{
+    QFETCH(quint32, seed);
+    QFETCH(int, count);
+    QRandomGenerator rng(seed);
+    KrSceneHarness h;
+    auto* root = new KrSceneTestBrick(QStringLiteral("Root"), 1);
+    for (int i = 0; i < 4; ++i)
+        root->addInput(QStringLiteral("in%1").arg(i));
+    QList<KrSceneTestBrick*> bricks = {root};
+    QList<KrBrickGraphicsItem*> items = {sizedBrick(h, root, QSize(120, 90))};
+    for (int i = 1; i < count; ++i) {
+        auto* brick = new KrSceneTestBrick(QStringLiteral("B%1").arg(i), 0);
+        for (int j = 0; j < 3; ++j)
+            brick->addInput(QStringLiteral("in%1").arg(j));
+        brick->addOutput(QStringLiteral("out"));
+        const QSize size(80 + int(rng.bounded(80)), 30 + int(rng.bounded(120)));
+        items << sizedBrick(h, brick, size, QPointF(rng.bounded(900), rng.bounded(900)));
+        // Feeds a free input of a brick made before it, so every brick is reached from the
+        // root; the "deep" row mostly extends the chain.
+        int to = seed == 11u && i > 1 && rng.bounded(4) ? i - 1 : int(rng.bounded(i));
+        bool wired = false;
+        for (int tries = 0; tries < i && !wired; ++tries, to = (to + 1) % i) {
+            KrSceneTestBrick* consumer = bricks.at(to);
+            for (int j = 0; j < consumer->getNumParameters() && !wired; ++j) {
+                KrBrickParam* input = consumer->getParameter(j);
+                wired = input->isInput() && input->getNumConnections() == 0 &&
+                        consumer->addConnection(j, brick, brick->getNumParameters() - 1);
+            }
+        }
+        QVERIFY(wired);
+        bricks << brick;
+    }
+    h.scene->autoArrange();
+    for (int i = 0; i < items.size(); ++i) {
+        const QRectF a(items.at(i)->pos(), items.at(i)->getFrame()->size());
+        for (int j = i + 1; j < items.size(); ++j) {
+            const QRectF b(items.at(j)->pos(), items.at(j)->getFrame()->size());
+            QVERIFY2(!a.intersects(b), qPrintable(QStringLiteral("%1 and %2 overlap")
+                                                      .arg(items.at(i)->getBrick()->getName(),
+                                                           items.at(j)->getBrick()->getName())));
+        }
+    }
+}
+
 void TestKrBrickUserScene::arrangeManyKeepsSceneSearchable()
 {
     KrSceneHarness h;
@@ -459,7 +517,6 @@ void TestKrBrickUserScene::arrangeManyKeepsSceneSearchable()
     h.scene->autoArrange();
     h.scene->flipBricksAboutCenter();
     krSceneSettle();
-    QCOMPARE(h.scene->itemIndexMethod(), QGraphicsScene::BspTreeIndex);
     // Every brick is found where it now is, and its wire reaches its consumer.
     for (KrBrickGraphicsItem* item : qAsConst(items)) {
         const QPointF inside = item->mapToScene(item->rect().center());
