@@ -628,6 +628,16 @@ int KrBrickResizeButton::horizontalPosition(QMouseEvent* event) const
     return parentWidget() ? mapToParent(event->pos()).x() : event->globalX();
 }
 
+void KrBrickResizeButton::mousePressEvent(QMouseEvent* event)
+{
+    KrStyledButton::mousePressEvent(event);
+    // The edge follows the pointer from the first move on.
+    if (event->button() == Qt::LeftButton) {
+        m_lastX = horizontalPosition(event);
+        m_firstMove = false;
+    }
+}
+
 void KrBrickResizeButton::mouseMoveEvent(QMouseEvent* event)
 {
     if (!(event->buttons() & Qt::LeftButton))

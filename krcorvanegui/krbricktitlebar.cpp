@@ -87,6 +87,8 @@ void KrBrickTitleBar::mousePressEvent(QMouseEvent* event)
     d->pressed = true;
     d->dragStarted = false;
     d->dragArmed = d->barRect.contains(event->pos()) && !d->closeRect.contains(event->pos());
+    if (d->target)
+        d->grabOffset = mapTo(d->target, event->pos());
 }
 
 void KrBrickTitleBar::mouseMoveEvent(QMouseEvent* event)
@@ -101,11 +103,10 @@ void KrBrickTitleBar::mouseMoveEvent(QMouseEvent* event)
         return;
     const QPoint inTarget = mapTo(d->target, event->pos());
     if (!d->dragStarted) {
-        d->grabOffset = inTarget;
         d->dragStarted = true;
         emit dragStarted();
-        return;
     }
+    // The point grabbed stays under the pointer, from the first move on.
     moveTargetBy(inTarget - d->grabOffset);
 }
 

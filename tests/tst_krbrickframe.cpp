@@ -629,11 +629,12 @@ void TestKrBrickFrame::titleBarDragMovesAndClamps()
 
     const QPoint g0 = bar->mapToGlobal(QPoint(20, 9));
     mouseAt(bar, QEvent::MouseButtonPress, g0);
+    // The point pressed stays under the pointer from the first move on.
     mouseAt(bar, QEvent::MouseMove, g0 + QPoint(3, 0));
-    QCOMPARE(target->pos(), QPoint(50, 60)); // the first move only grabs
+    QCOMPARE(target->pos(), QPoint(53, 60));
     QCOMPARE(started.count(), 1);
     mouseAt(bar, QEvent::MouseMove, g0 + QPoint(23, 10));
-    QCOMPARE(target->pos(), QPoint(70, 70));
+    QCOMPARE(target->pos(), QPoint(73, 70));
     QCOMPARE(bar->cursor().shape(), Qt::SizeAllCursor);
     mouseAt(bar, QEvent::MouseMove, g0 + QPoint(-300, -300));
     QCOMPARE(target->pos(), QPoint(10, 10));
@@ -723,8 +724,8 @@ void TestKrBrickFrame::titleBarDragInZoomedView()
     frameSendMouse(port, QEvent::MouseButtonPress, start);
     frameSendMouse(port, QEvent::MouseMove, start + QPoint(4, 0), Qt::NoButton);
     frameSendMouse(port, QEvent::MouseMove, start + QPoint(44, 20), Qt::NoButton);
-    // 40 by 20 pixels at 200 % are 20 by 10 in the scene: the bar stays under the cursor.
-    QCOMPARE(proxy->pos(), QPointF(120, 110));
+    // 44 by 20 pixels at 200 % are 22 by 10 in the scene: the bar stays under the cursor.
+    QCOMPARE(proxy->pos(), QPointF(122, 110));
     frameSendMouse(port, QEvent::MouseMove, start + QPoint(-400, 20), Qt::NoButton);
     QCOMPARE(proxy->pos(), QPointF(10, 110));
     frameSendMouse(port, QEvent::MouseButtonRelease, start + QPoint(-400, 20), Qt::LeftButton,
@@ -777,26 +778,27 @@ void TestKrBrickFrame::resizeButtonDrag()
     const QPoint g0 = button->mapToGlobal(QPoint(2, 2));
     mouseAt(button, QEvent::MouseButtonPress, g0);
     QCOMPARE(started.count(), 1);
+    // The edge follows the pointer from the first move on.
     mouseAt(button, QEvent::MouseMove, g0 + QPoint(10, 0));
-    QCOMPARE(frame.width(), width); // the first move only starts the drag
+    QCOMPARE(frame.width(), width + 10);
     mouseAt(button, QEvent::MouseMove, g0 + QPoint(20, 5));
     mouseAt(button, QEvent::MouseMove, g0 + QPoint(30, 9));
-    QCOMPARE(frame.width(), width + 20);
+    QCOMPARE(frame.width(), width + 30);
     QCOMPARE(frame.height(), height);
     mouseAt(button, QEvent::MouseMove, g0 + QPoint(25, 9));
-    QCOMPARE(frame.width(), width + 15);
+    QCOMPARE(frame.width(), width + 25);
     mouseAt(button, QEvent::MouseButtonRelease, g0 + QPoint(25, 9), Qt::LeftButton, Qt::NoButton);
     QCOMPARE(finished.count(), 1);
     QCOMPARE(clicked.count(), 0);
     QVERIFY(!button->isDown());
 
-    // A new drag starts afresh: its first move does not jump.
+    // A new drag starts from where it is pressed: nothing of the last drag carries over.
     const QPoint g1 = button->mapToGlobal(QPoint(2, 2));
     mouseAt(button, QEvent::MouseButtonPress, g1);
     mouseAt(button, QEvent::MouseMove, g1 + QPoint(40, 0));
-    QCOMPARE(frame.width(), width + 15);
+    QCOMPARE(frame.width(), width + 65);
     mouseAt(button, QEvent::MouseMove, g1 + QPoint(30, 0));
-    QCOMPARE(frame.width(), width + 5);
+    QCOMPARE(frame.width(), width + 55);
     mouseAt(button, QEvent::MouseButtonRelease, g1, Qt::LeftButton, Qt::NoButton);
     QCOMPARE(started.count(), 2);
     QCOMPARE(finished.count(), 2);
