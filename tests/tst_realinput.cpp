@@ -120,6 +120,23 @@ private:
             bar->mapTo(item->getFrame(), QPoint(bar->width() / 3, bar->height() / 2));
         return onScreen(item->mapToScene(local));
     }
+    // A constant beside a multiply, both in view, and the output and input to wire.
+    struct Pair
+    {
+        KrBrickGraphicsItem* source;
+        KrBrickGraphicsItem* target;
+        KrBrickParam* out;
+        KrBrickParam* in;
+    };
+    Pair addPair()
+    {
+        KrBrickGraphicsItem* source = add(new KrFloatConstantBrick, QPointF(3000, 3000));
+        KrBrickGraphicsItem* target = add(new KrMultiplyBrick, QPointF(3300, 3050));
+        view()->centerOn(QPointF(3200, 3100));
+        QTest::qWait(100);
+        return {source, target, firstParam(source->getBrick(), KrBrickParam::Output),
+                firstParam(target->getBrick(), KrBrickParam::Input)};
+    }
     KrBrickGraphicsItem* add(KrShaderBrick* brick, const QPointF& pos)
     {
         KrBrickGraphicsItem* item = scene()->addBrickAt(brick, pos);
@@ -186,12 +203,7 @@ void TestRealInput::dragTitleBarMovesAndUndoes()
 
 void TestRealInput::dragWireConnectsAndUndoes()
 {
-    KrBrickGraphicsItem* source = add(new KrFloatConstantBrick, QPointF(3000, 3000));
-    KrBrickGraphicsItem* target = add(new KrMultiplyBrick, QPointF(3300, 3000));
-    view()->centerOn(QPointF(3200, 3100));
-    QTest::qWait(100);
-    KrBrickParam* out = firstParam(source->getBrick(), KrBrickParam::Output);
-    KrBrickParam* in = firstParam(target->getBrick(), KrBrickParam::Input);
+    const auto [source, target, out, in] = addPair();
     QVERIFY(out && in);
     const int steps = krUndoStack->count();
 
@@ -217,12 +229,8 @@ void TestRealInput::dragWireConnectsAndUndoes()
 
 void TestRealInput::shiftClicksConnect()
 {
-    KrBrickGraphicsItem* source = add(new KrFloatConstantBrick, QPointF(3000, 3000));
-    KrBrickGraphicsItem* target = add(new KrMultiplyBrick, QPointF(3300, 3050));
-    view()->centerOn(QPointF(3200, 3100));
-    QTest::qWait(100);
-    KrBrickParam* out = firstParam(source->getBrick(), KrBrickParam::Output);
-    KrBrickParam* in = firstParam(target->getBrick(), KrBrickParam::Input);
+    const auto [source, target, out, in] = addPair();
+    QVERIFY(out && in);
     const int steps = krUndoStack->count();
 
     QStringList args = {QStringLiteral("keydown"), QStringLiteral("shift")};
