@@ -35,6 +35,7 @@
 #include <QStandardItemModel>
 #include <QTimer>
 
+#include <algorithm>
 #include <cmath>
 #include <memory>
 
@@ -84,6 +85,21 @@ public:
 
 private:
     QPointer<KrBrickContainer> m_container;
+};
+
+// Deletes what it holds when it is deleted itself.
+class KrItemReaper : public QObject
+{
+public:
+    explicit KrItemReaper(QList<QPointer<QObject>> items) : m_items(std::move(items)) {}
+    ~KrItemReaper() override
+    {
+        for (const QPointer<QObject>& item : qAsConst(m_items))
+            delete item.data();
+    }
+
+private:
+    QList<QPointer<QObject>> m_items;
 };
 
 void pushStep(KrUndoItem* item, const QString& text)
@@ -305,6 +321,20 @@ struct KrBrickUserScene::Private
     KrBrickLayoutUndoItem* flipAwaitingDirection = nullptr;
     // Open while the undo stack replays a step.
     std::unique_ptr<BrickBatch> replayBatch;
+    // Items taken out while many go at once are deleted together, by one deferred deletion:
+    // thousands of them queued one by one make every later post and removal search the queue.
+    int reapDepth = 0;
+    QList<QPointer<QObject>> doomed;
+
+    void beginReaping() { ++reapDepth; }
+    void endReaping()
+    {
+        if (reapDepth <= 0 || --reapDepth > 0 || doomed.isEmpty())
+            return;
+        auto* reaper = new KrItemReaper(std::move(doomed));
+        doomed.clear();
+        reaper->deleteLater();
+    }
     QPointer<KrUndoStack> watchedStack;
 
     IKrBrickUser* user() const { return userObject ? brickUser : nullptr; }
@@ -319,10 +349,14 @@ struct KrBrickUserScene::Private
         if (watchedStack)
             QObject::disconnect(watchedStack, nullptr, scene, nullptr);
         watchedStack = stack;
-        QObject::connect(stack, &KrUndoStack::replayStarted, scene,
-                         [this] { replayBatch.reset(new BrickBatch(user())); });
-        QObject::connect(stack, &KrUndoStack::replayFinished, scene,
-                         [this] { replayBatch.reset(); });
+        QObject::connect(stack, &KrUndoStack::replayStarted, scene, [this] {
+            replayBatch.reset(new BrickBatch(user()));
+            beginReaping();
+        });
+        QObject::connect(stack, &KrUndoStack::replayFinished, scene, [this] {
+            replayBatch.reset();
+            endReaping();
+        });
     }
 };
 
@@ -360,6 +394,11 @@ KrBrickUserScene::KrBrickUserScene(IKrBrickUser* brickUser, QGraphicsView* view,
 KrBrickUserScene::~KrBrickUserScene()
 {
     d->destroying = true;
+    // Items waiting for the end of a batch still go.
+    if (d->reapDepth > 0) {
+        d->reapDepth = 1;
+        d->endReaping();
+    }
     for (KrBrickSceneUndoItem* item : qAsConst(d->undoItems))
         item->forgetScene();
     d->undoItems.clear();
@@ -642,7 +681,11 @@ void KrBrickUserScene::takeOutItem(KrBrickGraphicsItem* item, bool record)
     }
     KrApp* app = KrApp::existingInstance();
     if (app && !app->isClosing()) {
-        item->deleteLater();
+        // Later: the item may be in the middle of handling the event that removes it.
+        if (d->reapDepth > 0)
+            d->doomed.append(item);
+        else
+            item->deleteLater();
         if (!d->destroying && d->focusHolder)
             d->focusHolder->setFocus(Qt::OtherFocusReason);
     } else {
@@ -652,13 +695,19 @@ void KrBrickUserScene::takeOutItem(KrBrickGraphicsItem* item, bool record)
 
 void KrBrickUserScene::deleteSelected()
 {
-    const QList<KrBrickGraphicsItem*> items = getSelectedBricks();
+    QList<KrBrickGraphicsItem*> items = getSelectedBricks();
     if (items.isEmpty())
         return;
+    // The scene keeps its items in a list ordered by address, and taking one out moves the
+    // shorter side of it: bricks taken in address order (their parts were made with them)
+    // leave from one end, so deleting thousands moves next to nothing.
+    std::sort(items.begin(), items.end(), std::greater<KrBrickGraphicsItem*>());
     KrUndoStackHold hold;
     BrickBatch batch(d->user());
+    d->beginReaping();
     for (KrBrickGraphicsItem* item : items)
         removeBrickItem(item);
+    d->endReaping();
     hold.accept(QStringLiteral("Delete Bricks"));
 }
 
