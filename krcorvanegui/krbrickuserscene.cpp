@@ -1382,12 +1382,23 @@ void KrBrickUserScene::keyPressEvent(QKeyEvent* event)
     QGraphicsScene::keyPressEvent(event);
     if (event->isAccepted())
         return;
-    // No item took the key: Delete removes the selected bricks.
+    // No item took the key: Delete removes the selected bricks, Ctrl+A selects every brick,
+    // and Escape gives up a connection begun with Shift+click, or else the selection.
     if (event->matches(QKeySequence::Delete) || event->key() == Qt::Key_Backspace) {
         if (!getSelectedBricks().isEmpty()) {
             deleteSelected();
             event->accept();
         }
+    } else if (event->matches(QKeySequence::SelectAll)) {
+        for (KrBrickGraphicsItem* item : qAsConst(d->itemsById))
+            item->setSelected(true);
+        event->accept();
+    } else if (event->key() == Qt::Key_Escape && event->modifiers() == Qt::NoModifier) {
+        if (isConnectMode())
+            setConnectMode(false);
+        else
+            clearSelection();
+        event->accept();
     }
 }
 

@@ -93,6 +93,7 @@ private slots:
     void idChangeRefilesItem();
     void deleteSelectedIsOneStep();
     void deleteKey();
+    void selectAllAndEscapeKeys();
     void undoAfterSceneClosedDoesNothing();
     void removedConnectionWithoutSourceUndoesNothing();
     void arrangeTree();
@@ -285,6 +286,30 @@ void TestKrBrickUserScene::deleteKey()
     QTest::keyClick(h.view->viewport(), Qt::Key_Delete);
     krSceneSettle();
     QVERIFY(h.scene->getItemsById().isEmpty());
+}
+
+void TestKrBrickUserScene::selectAllAndEscapeKeys()
+{
+    KrSceneHarness h;
+    KrSceneTestBrick* a = chainBrick(QStringLiteral("A"));
+    KrSceneTestBrick* b = chainBrick(QStringLiteral("B"));
+    h.add(a, QPointF(100, 100));
+    h.add(b, QPointF(400, 100));
+    h.view->setFocus();
+    h.scene->setFocusItem(h.scene->getFocusHolder());
+
+    QTest::keyClick(h.view->viewport(), Qt::Key_A, Qt::ControlModifier);
+    QCOMPARE(h.scene->getSelectedBricks().size(), 2);
+
+    // Escape first gives up a connection begun with Shift+click, then the selection.
+    h.scene->setConnectMode(true, h.plug(a, QStringLiteral("out")), QPointF(), true);
+    QVERIFY(h.scene->isConnectMode());
+    QTest::keyClick(h.view->viewport(), Qt::Key_Escape);
+    QVERIFY(!h.scene->isConnectMode());
+    QCOMPARE(h.scene->getSelectedBricks().size(), 2);
+    QTest::keyClick(h.view->viewport(), Qt::Key_Escape);
+    QVERIFY(h.scene->getSelectedBricks().isEmpty());
+    QCOMPARE(h.scene->getItemsById().size(), 2);
 }
 
 void TestKrBrickUserScene::undoAfterSceneClosedDoesNothing()
