@@ -37,7 +37,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <memory>
 
 namespace {
 const QString kPosX = QStringLiteral("PosX");
@@ -63,29 +62,6 @@ bool canRecord()
     KrUndoStack* stack = sceneUndoStack();
     return stack && stack->canPushItems();
 }
-
-// Holds back the brick user's exposed-property rebuild while many bricks come and go: it is
-// made once at the end instead of once per brick.
-class BrickBatch
-{
-public:
-    explicit BrickBatch(IKrBrickUser* user)
-        : m_container(user ? user->getBrickContainer() : nullptr)
-    {
-        if (m_container)
-            m_container->beginBatch();
-    }
-    ~BrickBatch()
-    {
-        if (m_container)
-            m_container->endBatch();
-    }
-    BrickBatch(const BrickBatch&) = delete;
-    BrickBatch& operator=(const BrickBatch&) = delete;
-
-private:
-    QPointer<KrBrickContainer> m_container;
-};
 
 // Deletes what it holds when it is deleted itself.
 class KrItemReaper : public QObject
@@ -319,17 +295,31 @@ struct KrBrickUserScene::Private
     bool arranging = false;
     // A flip whose step also takes the direction change that comes right after it.
     KrBrickLayoutUndoItem* flipAwaitingDirection = nullptr;
-    // Open while the undo stack replays a step.
-    std::unique_ptr<BrickBatch> replayBatch;
-    // Items taken out while many go at once are deleted together, by one deferred deletion:
-    // thousands of them queued one by one make every later post and removal search the queue.
-    int reapDepth = 0;
+    // Many bricks going or coming at once (a delete, a group, an undo or redo): the brick
+    // user's exposed properties are rebuilt once, at the end, and the items taken out are
+    // deleted together by one deferred deletion. Thousands queued one by one would make every
+    // later post and removal search the queue.
+    int batchDepth = 0;
+    QPointer<KrBrickContainer> batchContainer;
     QList<QPointer<QObject>> doomed;
 
-    void beginReaping() { ++reapDepth; }
-    void endReaping()
+    void beginBatch()
     {
-        if (reapDepth <= 0 || --reapDepth > 0 || doomed.isEmpty())
+        if (batchDepth++ > 0)
+            return;
+        IKrBrickUser* brickUser = user();
+        batchContainer = brickUser ? brickUser->getBrickContainer() : nullptr;
+        if (batchContainer)
+            batchContainer->beginBatch();
+    }
+    void endBatch()
+    {
+        if (batchDepth <= 0 || --batchDepth > 0)
+            return;
+        if (batchContainer)
+            batchContainer->endBatch();
+        batchContainer = nullptr;
+        if (doomed.isEmpty())
             return;
         auto* reaper = new KrItemReaper(std::move(doomed));
         doomed.clear();
@@ -349,14 +339,8 @@ struct KrBrickUserScene::Private
         if (watchedStack)
             QObject::disconnect(watchedStack, nullptr, scene, nullptr);
         watchedStack = stack;
-        QObject::connect(stack, &KrUndoStack::replayStarted, scene, [this] {
-            replayBatch.reset(new BrickBatch(user()));
-            beginReaping();
-        });
-        QObject::connect(stack, &KrUndoStack::replayFinished, scene, [this] {
-            replayBatch.reset();
-            endReaping();
-        });
+        QObject::connect(stack, &KrUndoStack::replayStarted, scene, [this] { beginBatch(); });
+        QObject::connect(stack, &KrUndoStack::replayFinished, scene, [this] { endBatch(); });
     }
 };
 
@@ -395,9 +379,9 @@ KrBrickUserScene::~KrBrickUserScene()
 {
     d->destroying = true;
     // Items waiting for the end of a batch still go.
-    if (d->reapDepth > 0) {
-        d->reapDepth = 1;
-        d->endReaping();
+    if (d->batchDepth > 0) {
+        d->batchDepth = 1;
+        d->endBatch();
     }
     for (KrBrickSceneUndoItem* item : qAsConst(d->undoItems))
         item->forgetScene();
@@ -682,7 +666,7 @@ void KrBrickUserScene::takeOutItem(KrBrickGraphicsItem* item, bool record)
     KrApp* app = KrApp::existingInstance();
     if (app && !app->isClosing()) {
         // Later: the item may be in the middle of handling the event that removes it.
-        if (d->reapDepth > 0)
+        if (d->batchDepth > 0)
             d->doomed.append(item);
         else
             item->deleteLater();
@@ -703,11 +687,10 @@ void KrBrickUserScene::deleteSelected()
     // leave from one end, so deleting thousands moves next to nothing.
     std::sort(items.begin(), items.end(), std::greater<KrBrickGraphicsItem*>());
     KrUndoStackHold hold;
-    BrickBatch batch(d->user());
-    d->beginReaping();
+    d->beginBatch();
     for (KrBrickGraphicsItem* item : items)
         removeBrickItem(item);
-    d->endReaping();
+    d->endBatch();
     hold.accept(QStringLiteral("Delete Bricks"));
 }
 
@@ -739,7 +722,7 @@ void KrBrickUserScene::toGroup()
     KrBrickGraphicsItem* groupItem = nullptr;
     {
         KrUndoStackHold hold;
-        BrickBatch batch(user);
+        d->beginBatch();
         // Wires from grouped bricks to bricks left outside; the group's outputs take them.
         QList<QPair<KrBrickParam*, KrBrickParam*>> outgoing;
         for (KrBrickGraphicsItem* item : qAsConst(grouped)) {
@@ -784,6 +767,7 @@ void KrBrickUserScene::toGroup()
         }
         for (int i = grouped.size() - 1; i >= 0; --i)
             removeBrickItem(grouped.at(i));
+        d->endBatch();
         hold.accept(QStringLiteral("Group Bricks"));
     }
     group->unref();

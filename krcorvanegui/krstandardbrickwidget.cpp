@@ -65,9 +65,7 @@ private:
     QPointer<KrBrickParam> m_param;
     QString m_old, m_new;
 };
-} // namespace
 
-namespace {
 // A wired advanced parameter stays: its wire must end somewhere.
 bool listsParam(const KrBrickParam* param, bool hideAdvanced)
 {
